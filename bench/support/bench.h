@@ -1,0 +1,40 @@
+#pragma once
+
+#include <benchmark/benchmark.h>
+
+#include <cstddef>
+#include <string>
+
+/// What every benchmark shares. A case is named Operation/type/size; beside it stand, in the same run,
+/// ".../copy", a plain copy of the same bytes, and ".../peer:<what>", what a user would call instead.
+/// bench/compare pairs them by these names.
+namespace zelt_bench {
+
+/// Registers the plain copy that belongs to a case: reads and writes the given number of bytes.
+void register_copy(const std::string& case_name, std::size_t bytes);
+
+/// Registers a case. It runs `check` once before it is timed: a wrong result is reported and never timed.
+template <class Check, class Work>
+void register_case(const std::string& name, Check check, Work work)
+{
+    benchmark::RegisterBenchmark(name.c_str(), [=](benchmark::State& state) {
+        if (!check()) {
+            state.SkipWithError("wrong result");
+            return;
+        }
+        for (auto _ : state) {
+            work();
+            benchmark::ClobberMemory();
+        }
+    });
+}
+
+/// Registers the peer of a case, named for instance "Median/u8/2048", "medianBlur".
+template <class Work>
+void register_peer(const std::string& case_name, const std::string& peer, Work work)
+{
+    register_case(
+        case_name + "/peer:" + peer, [] { return true; }, work);
+}
+
+} // namespace zelt_bench
