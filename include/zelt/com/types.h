@@ -34,6 +34,7 @@ inline constexpr HRESULT E_POINTER = make_hresult(0x80004003);
 inline constexpr HRESULT E_FAIL = make_hresult(0x80004005);
 inline constexpr HRESULT E_SIZE_MISMATCH = make_hresult(0x8004000D); ///< a descriptor of another size than the input
 inline constexpr HRESULT E_UNEXPECTED = make_hresult(0x8000FFFF);
+inline constexpr HRESULT E_ACCESSDENIED = make_hresult(0x80070005);
 inline constexpr HRESULT E_OUTOFMEMORY = make_hresult(0x8007000E);
 inline constexpr HRESULT E_INVALIDARG = make_hresult(0x80070057);
 inline constexpr HRESULT CLASS_E_NOAGGREGATION = make_hresult(0x80040110);

@@ -1,0 +1,177 @@
+// The image component: images, their descriptors and locks, the converter, notifications, the statistics store.
+//
+// Images own a packed buffer or wrap memory of the caller with any offset and signed strides. Locks keep the image
+// alive and give its pixels; they do not shut each other out. Reading one image from many threads is always safe;
+// threads that write and read one image at the same time need an order of their own, as with any array.
+#pragma once
+
+#include "zelt/com/variant.h"
+#include "zelt/pixmat/layout.h"
+#include "zelt/pixmat/values.h"
+
+namespace Qor::Luxar {
+
+/// A property bag for a layout; nothing is checked here. All values are 32-bit; offset and strides are in bytes.
+struct IPixmatDescriptor : IDispatch {
+    static constexpr GUID iid = guid("5a1e0000-0201-4000-8000-00000000c0de");
+    static constexpr const char* interface_name = "IPixmatDescriptor";
+    using base = IDispatch;
+
+    virtual HRESULT get_Width(LONG* value) noexcept = 0;
+    virtual HRESULT put_Width(LONG value) noexcept = 0;
+    virtual HRESULT get_Height(LONG* value) noexcept = 0;
+    virtual HRESULT put_Height(LONG value) noexcept = 0;
+    virtual HRESULT get_Bits(LONG* value) noexcept = 0;
+    virtual HRESULT put_Bits(LONG value) noexcept = 0;
+    virtual HRESULT get_Encoding(PixmatEncoding* value) noexcept = 0;
+    virtual HRESULT put_Encoding(PixmatEncoding value) noexcept = 0;
+    virtual HRESULT get_Offset(LONG* value) noexcept = 0;
+    virtual HRESULT put_Offset(LONG value) noexcept = 0;
+    virtual HRESULT get_XStride(LONG* value) noexcept = 0;
+    virtual HRESULT put_XStride(LONG value) noexcept = 0;
+    virtual HRESULT get_YStride(LONG* value) noexcept = 0;
+    virtual HRESULT put_YStride(LONG value) noexcept = 0;
+};
+
+/// Access to the pixels of one image; it ends when the last reference goes.
+struct IPixmatLock : IUnknown {
+    static constexpr GUID iid = guid("5a1e0000-0202-4000-8000-00000000c0de");
+    static constexpr const char* interface_name = "IPixmatLock";
+    using base = IUnknown;
+
+    /// The buffer that the descriptor's offset and strides address. `reserved` is 0.
+    virtual uint8_t* Data(LONG reserved) noexcept = 0;
+    /// Announces a complete result: drops the image's keyed statistics, then notifies its event sinks.
+    /// `changed` null means the whole image. E_INVALIDARG for a read lock.
+    virtual HRESULT Commit(const rectangle* changed) noexcept = 0;
+};
+
+/// When sinks are told of a change. Any other value is refused.
+enum PixmatEventMode : int32_t {
+    PixmatEventMode_AfterCommit = 1,
+};
+
+struct IPixmat2;
+
+/// What a listener to images implements.
+struct IPixmatEvents : IUnknown {
+    static constexpr GUID iid = guid("5a1e0000-0203-4000-8000-00000000c0de");
+    static constexpr const char* interface_name = "IPixmatEvents";
+    using base = IUnknown;
+
+    /// Comes on the committing thread. `changed` null means the whole image. The answer is not looked at.
+    virtual HRESULT OnPixmatChanged(IPixmat2* image, const rectangle* changed) noexcept = 0;
+};
+
+struct IPixmat2 : IDispatch {
+    static constexpr GUID iid = guid("5a1e0000-0204-4000-8000-00000000c0de");
+    static constexpr const char* interface_name = "IPixmat2";
+    using base = IDispatch;
+
+    /// The image as it is now: a new descriptor each time.
+    virtual HRESULT GetDescriptor(IPixmatDescriptor** out) noexcept = 0;
+    /// `area` null means the whole image; a rectangle that leaves the image is E_INVALIDARG. `scale` is 1.0,
+    /// any other value is E_INVALIDARG. The lock's data are those of the whole image in either case.
+    virtual HRESULT OpenRead(IRectangle* area, double scale, IPixmatLock** out) noexcept = 0;
+    /// A write lock that is released without Commit drops the keyed statistics, since pixels may have changed,
+    /// but notifies nobody.
+    virtual HRESULT OpenWrite(IPixmatLock** out) noexcept = 0;
+    /// A packed copy with its own memory; statistics and listeners do not come along.
+    virtual HRESULT Clone(IPixmat2** out) noexcept = 0;
+    /// One sink may be given once; a second time is E_INVALIDARG.
+    virtual HRESULT StartNotifications(IPixmatEvents* sink, PixmatEventMode mode) noexcept = 0;
+    /// E_INVALIDARG for a sink that is not listening.
+    virtual HRESULT StopNotifications(IPixmatEvents* sink) noexcept = 0;
+};
+
+/// Keyed values that live on an image until its pixels change.
+struct IPixmatStatisticsStore : IUnknown {
+    static constexpr GUID iid = guid("5a1e0000-0205-4000-8000-00000000c0de");
+    static constexpr const char* interface_name = "IPixmatStatisticsStore";
+    using base = IUnknown;
+
+    /// Copies the value; null pointers are E_POINTER.
+    virtual HRESULT SetValue(BSTR key, const VARIANT* value) noexcept = 0;
+    /// S_OK and a copy for a key that is present, else S_FALSE and an empty value.
+    virtual HRESULT GetValue(BSTR key, VARIANT* value) noexcept = 0;
+};
+
+/// The component's pixel pipeline between two layouts: values through a lookup table or through levels.
+struct IPixmatTransfer : IUnknown {
+    static constexpr GUID iid = guid("5a1e0000-0206-4000-8000-00000000c0de");
+    static constexpr const char* interface_name = "IPixmatTransfer";
+    using base = IUnknown;
+
+    /// Null pointers are E_POINTER; layouts of different width or height, or a pair without mapping, E_NOTIMPL or
+    /// E_INVALIDARG before anything is written. The last two are 0.
+    virtual HRESULT Run(const void* source, void* target, const rectangle* source_area,
+                        const coordinate<int32_t>* target_point) noexcept = 0;
+    /// `count` colour numbers (see ILookupTable) over the value range low..high: the entry of a value v is
+    /// floor((v - low) / (high - low) * count), limited to the table. Targets must be colour.
+    virtual HRESULT SetLookupTable(const uint32_t* entries, LONG count, double low, double high) noexcept = 0;
+    virtual HRESULT SetContrast(double value) noexcept = 0;
+    virtual HRESULT SetBrightness(double value) noexcept = 0;
+    virtual HRESULT SetGamma(double value) noexcept = 0;
+    virtual HRESULT SetSigma(double value) noexcept = 0;
+};
+
+/// Element-wise copy and conversion between two layouts. A new object for each use; it has no state.
+/// Both conversions take any strides; a rectangle that leaves the source or lands outside the destination is
+/// E_INVALIDARG before anything is written; a region of non-positive width or height is an empty success.
+struct IPixmatConverter : IUnknown {
+    static constexpr GUID iid = guid("5a1e0000-0207-4000-8000-00000000c0de");
+    static constexpr const char* interface_name = "IPixmatConverter";
+    using base = IUnknown;
+
+    /// Carries values over. To integers: rounded half away from zero, limited to the target's nominal range (12
+    /// bits: 4095), NaN is 0. To float: the value itself, unscaled. Grey to colour repeats the grey limited to 8
+    /// bits, alpha 255; colour to grey is 0.299 R + 0.587 G + 0.114 B, rounded (to float: not rounded); colour to
+    /// colour reorders, keeps alpha between four-byte layouts, else alpha is 255. Real to complex sets the
+    /// imaginary part 0; complex to real takes the real part; complex and half-complex to the same kind in the
+    /// other precision is element-wise. Anything else is E_NOTIMPL.
+    virtual HRESULT ConvertRecode(const image_layout& source_layout, const void* source,
+                                  const image_layout& target_layout, void* target,
+                                  const rectangle* source_area,
+                                  const coordinate<int32_t>* target_point) noexcept = 0;
+    /// Reserved: E_NOTIMPL.
+    virtual HRESULT Reserved1() noexcept = 0;
+    virtual HRESULT ConvertCopy(const image_layout& source_layout, const image_layout& target_layout,
+                                IPixmatTransfer** out) noexcept = 0;
+    /// Reserved: E_NOTIMPL.
+    virtual HRESULT Reserved2() noexcept = 0;
+    /// The plain numeric conversion: truncation toward zero, low bits kept (through a 64-bit integer; NaN and
+    /// values beyond 64 bits give 0), nothing limited. Colour casts to the same layout only.
+    virtual HRESULT ConvertCast(const image_layout& source_layout, const void* source,
+                                const image_layout& target_layout, void* target, const rectangle* source_area,
+                                const coordinate<int32_t>* target_point) noexcept = 0;
+};
+
+/// What the factory makes of a descriptor.
+enum PixmatCreateMode : int32_t {
+    PixmatCreateMode_Layout = 1, ///< the layout as it is, strides and offset included
+    PixmatCreateMode_Packed = 2, ///< size, bits and encoding; packed, whatever the strides say
+};
+
+/// Called once, when a wrapped buffer is no longer in use.
+using pixmat_release = void (*)(void* context) noexcept;
+
+struct IPixmatFactory : IDispatch {
+    static constexpr GUID iid = guid("5a1e0000-0208-4000-8000-00000000c0de");
+    static constexpr const char* interface_name = "IPixmatFactory";
+    using base = IDispatch;
+
+    /// A zero-filled image. Any encoding is accepted. E_INVALIDARG for a null descriptor, negative sizes, bits below
+    /// 1 or a layout whose pixels leave 64-bit addresses; E_OUTOFMEMORY when it cannot be had.
+    virtual HRESULT Create(IPixmatDescriptor* descriptor, PixmatCreateMode mode, IPixmat2** out) noexcept = 0;
+};
+
+inline constexpr GUID CLSID_PixmatDescriptor = guid("5a1e0001-0201-4000-8000-00000000c0de");
+inline constexpr GUID CLSID_PixmatFactory = guid("5a1e0001-0208-4000-8000-00000000c0de");
+inline constexpr GUID CLSID_PixmatConverter = guid("5a1e0001-0207-4000-8000-00000000c0de");
+
+/// An image over memory of the caller: data + offset is pixel (0,0). `release(context)`, if given, is called once when
+/// the image goes; not when this call fails. A read-only image refuses OpenWrite with E_ACCESSDENIED.
+ZELT_API HRESULT WrapPixmat(const image_layout& layout, void* data, bool read_only, pixmat_release release,
+                            void* context, IPixmat2** out) noexcept;
+
+} // namespace Qor::Luxar
