@@ -33,7 +33,9 @@ if(NOT ZELT_FUZZ)
     target_include_directories(zelt INTERFACE
         $<BUILD_INTERFACE:${PROJECT_SOURCE_DIR}/include> $<INSTALL_INTERFACE:${CMAKE_INSTALL_INCLUDEDIR}>)
     target_link_libraries(zelt PRIVATE ${system_libraries} Threads::Threads ${CMAKE_DL_LIBS})
-    target_link_options(zelt PRIVATE -Wl,--exclude-libs,ALL)
+    target_link_options(zelt PRIVATE
+        -Wl,--exclude-libs,ALL -Wl,--version-script=${PROJECT_SOURCE_DIR}/cmake/zelt.map)
+    set_property(TARGET zelt APPEND PROPERTY LINK_DEPENDS ${PROJECT_SOURCE_DIR}/cmake/zelt.map)
     # Clang leaves the sanitizers' own symbols to the executable.
     if(NOT (ZELT_SANITIZE AND CMAKE_CXX_COMPILER_ID MATCHES "Clang"))
         target_link_options(zelt PRIVATE -Wl,--no-undefined)

@@ -41,7 +41,8 @@ def target_of(name, file, root):
         if not path.is_relative_to(root / "src"):
             return set()
     parts = path.relative_to(root / "src").parts
-    return {parts[0], "/".join(parts)} | ({"kernels"} if parts[1] == "kernels" else set())
+    in_kernels = len(parts) > 2 and parts[1] == "kernels"
+    return {parts[0], "/".join(parts)} | ({"kernels"} if in_kernels else set())
 
 
 def allowed_for(file, root):
@@ -57,7 +58,7 @@ def allowed_for(file, root):
         return None, room
     if room in LOWER:
         return LOWER[room], room
-    if parts[2] == "kernels":
+    if len(parts) > 3 and parts[2] == "kernels":
         return KERNEL, room + "/kernels"
     return FACET, room
 

@@ -1,4 +1,4 @@
-#include "support/bench.h"
+#include "bench.h"
 
 #include <opencv2/core.hpp>
 

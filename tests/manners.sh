@@ -1,0 +1,23 @@
+#!/bin/sh
+# The library never prints, ends the process, reads the environment or installs a signal handler:
+# none of the functions that do is among the symbols it takes from elsewhere.
+#   manners.sh LIBRARY
+set -eu
+library=$1
+
+undefined=$(nm -D --undefined-only "$library" | awk '{print $NF}' | sed 's/@.*//' | sort -u)
+[ -n "$undefined" ] || { echo "manners: no symbols read from $library" >&2; exit 1; }
+
+forbidden='abort exit _exit _Exit quick_exit __assert_fail raise kill system popen
+getenv secure_getenv __secure_getenv setenv putenv environ __environ
+signal sigaction __sysv_signal bsd_signal sigprocmask pthread_sigmask
+printf vprintf puts putchar fprintf vfprintf fputs fputc putc perror psignal dprintf syslog
+__printf_chk __vprintf_chk __fprintf_chk __vfprintf_chk stdout stderr
+_ZSt4cout _ZSt4cerr _ZSt4clog _ZSt5wcout _ZSt5wcerr _ZSt5wclog setlocale'
+
+found=$(for name in $forbidden; do echo "$undefined" | grep -Fx -- "$name" || true; done)
+if [ -n "$found" ]; then
+    echo "manners: $library calls or uses:" $found >&2
+    exit 1
+fi
+echo "manners: none of the forbidden names among $(echo "$undefined" | wc -l) undefined symbols"
