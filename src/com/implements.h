@@ -1,0 +1,125 @@
+// The base of every object: reference count, QueryInterface, late binding and error support, written once.
+#pragma once
+
+#include "com/invoke.h"
+#include "zelt/com/dispatch.h"
+#include "zelt/com/interface_table.h"
+
+#include <atomic>
+#include <new>
+
+namespace Qor {
+
+namespace detail {
+
+/// The pointer to an interface that answers to an identifier, itself or by what it extends.
+template <class Interface, class Object> bool answer(Object* object, const GUID& id, void** out) noexcept
+{
+    if (id == Interface::iid) {
+        *out = static_cast<Interface*>(object);
+        return true;
+    }
+    if constexpr (!std::is_same_v<Interface, IUnknown>)
+        return answer<typename Interface::base>(static_cast<Interface*>(object), id, out);
+    else
+        return false;
+}
+
+} // namespace detail
+
+/// A counted object with these interfaces. It starts with one reference; see make().
+template <class First, class... Others> class implements : public First, public Others... {
+public:
+    HRESULT QueryInterface(const GUID& id, void** out) noexcept override
+    {
+        if (!out) return E_POINTER;
+        *out = nullptr;
+        // IUnknown always comes from the first interface: identity of objects rests on it.
+        if (!(detail::answer<First>(this, id, out) || (detail::answer<Others>(this, id, out) || ...)))
+            return E_NOINTERFACE;
+        AddRef();
+        return S_OK;
+    }
+    ULONG AddRef() noexcept override { return references_.fetch_add(1, std::memory_order_relaxed) + 1; }
+    ULONG Release() noexcept override
+    {
+        const ULONG left = references_.fetch_sub(1, std::memory_order_acq_rel) - 1;
+        if (left == 0) delete this;
+        return left;
+    }
+
+    implements(const implements&) = delete;
+    implements& operator=(const implements&) = delete;
+
+protected:
+    implements() noexcept = default;
+    virtual ~implements() = default;
+
+private:
+    std::atomic<ULONG> references_{1};
+};
+
+/// The description of an interface; each is defined beside its table.
+template <class Interface> const interface_info& table_of() noexcept;
+
+/// A scriptable object: its first interface is dual and described by a table.
+template <class First, class... Others>
+class automation : public implements<First, Others..., ISupportErrorInfo> {
+public:
+    HRESULT GetTypeInfoCount(uint32_t* count) noexcept override
+    {
+        if (!count) return E_POINTER;
+        *count = 1;
+        return S_OK;
+    }
+    HRESULT GetTypeInfo(uint32_t index, LCID, ITypeInfo** info) noexcept override
+    {
+        return get_type_info(table_of<First>(), index, info);
+    }
+    HRESULT GetIDsOfNames(const GUID&, OLECHAR** names, uint32_t count, LCID, DISPID* ids) noexcept override
+    {
+        return find_ids(table_of<First>(), names, count, ids);
+    }
+    HRESULT Invoke(DISPID id, const GUID&, LCID, uint16_t flags, DISPPARAMS* params, VARIANT* result,
+                   EXCEPINFO* exception, uint32_t* bad_argument) noexcept override
+    {
+        return invoke(table_of<First>(), static_cast<First*>(this), invoke_form::standard,
+                      {id, flags, params, result, exception, bad_argument});
+    }
+    HRESULT InterfaceSupportsErrorInfo(const GUID& id) noexcept override
+    {
+        return id == First::iid ? S_OK : S_FALSE;
+    }
+
+    using described_interface = First;
+};
+
+/// The same object for script hosts: methods that take images accept calls that leave optional images out.
+template <class Base> class scripting : public Base {
+public:
+    using Base::Base;
+
+    HRESULT Invoke(DISPID id, const GUID&, LCID, uint16_t flags, DISPPARAMS* params, VARIANT* result,
+                   EXCEPINFO* exception, uint32_t* bad_argument) noexcept override
+    {
+        using described = typename Base::described_interface;
+        return invoke(table_of<described>(), static_cast<described*>(this), invoke_form::scripting,
+                      {id, flags, params, result, exception, bad_argument});
+    }
+};
+
+/// A new object, or std::bad_alloc, or what its constructor throws.
+template <class T, class... Args> com_ptr<T> make(Args&&... args)
+{
+    return com_ptr<T>::attach(new T(std::forward<Args>(args)...));
+}
+
+/// A new object whose constructor cannot throw; null when memory runs out.
+template <class T, class... Args>
+    requires std::is_nothrow_constructible_v<T, Args...>
+com_ptr<T> try_make(Args&&... args) noexcept
+{
+    return com_ptr<T>::attach(new (std::nothrow) T(std::forward<Args>(args)...));
+}
+
+} // namespace Qor
