@@ -62,10 +62,11 @@ private:
 /// The description of an interface; each is defined beside its table.
 template <class Interface> const interface_info& table_of() noexcept;
 
-/// A scriptable object: its first interface is dual and described by a table.
-template <class First, class... Others>
-class automation : public implements<First, Others..., ISupportErrorInfo> {
+/// Late binding for an object whose first interface is dual and described by a table.
+template <class Base, class First> class dispatching : public Base {
 public:
+    using Base::Base;
+
     HRESULT GetTypeInfoCount(uint32_t* count) noexcept override
     {
         if (!count) return E_POINTER;
@@ -86,12 +87,78 @@ public:
         return invoke(table_of<First>(), static_cast<First*>(this), invoke_form::standard,
                       {id, flags, params, result, exception, bad_argument});
     }
-    HRESULT InterfaceSupportsErrorInfo(const GUID& id) noexcept override
-    {
-        return id == First::iid ? S_OK : S_FALSE;
-    }
 
     using described_interface = First;
+};
+
+/// Says that failures of the main interface leave error information.
+template <class First> struct error_support : ISupportErrorInfo {
+    HRESULT InterfaceSupportsErrorInfo(const GUID& id) noexcept override { return id == First::iid ? S_OK : S_FALSE; }
+};
+
+/// Safe for untrusted callers and untrusted data, always.
+struct safe_for_scripts : IObjectSafety {
+    HRESULT GetInterfaceSafetyOptions(const GUID&, uint32_t* supported, uint32_t* enabled) noexcept override
+    {
+        if (!supported || !enabled) return E_POINTER;
+        *supported = *enabled = INTERFACESAFE_FOR_UNTRUSTED_CALLER | INTERFACESAFE_FOR_UNTRUSTED_DATA;
+        return S_OK;
+    }
+    HRESULT SetInterfaceSafetyOptions(const GUID&, uint32_t, uint32_t) noexcept override { return S_OK; }
+};
+
+/// A scriptable object.
+template <class First, class... Others>
+using automation = dispatching<implements<First, Others..., error_support<First>>, First>;
+
+/// Like implements, for objects that may become part of an outer object. The outer one then answers for identity
+/// and counts references; it holds this object by inner().
+template <class First, class... Others> class aggregatable : public First, public Others... {
+public:
+    HRESULT QueryInterface(const GUID& id, void** out) noexcept override { return outer_->QueryInterface(id, out); }
+    ULONG AddRef() noexcept override { return outer_->AddRef(); }
+    ULONG Release() noexcept override { return outer_->Release(); }
+
+    /// The object's own IUnknown, with its own count, whoever owns it.
+    IUnknown* inner() noexcept { return &inner_; }
+
+    aggregatable(const aggregatable&) = delete;
+    aggregatable& operator=(const aggregatable&) = delete;
+
+protected:
+    explicit aggregatable(IUnknown* outer) noexcept : inner_(*this), outer_(outer ? outer : &inner_) {}
+    virtual ~aggregatable() = default;
+
+private:
+    class own_unknown final : public IUnknown {
+    public:
+        explicit own_unknown(aggregatable& owner) noexcept : owner_(owner) {}
+        HRESULT QueryInterface(const GUID& id, void** out) noexcept override
+        {
+            if (!out) return E_POINTER;
+            *out = nullptr;
+            if (id == IUnknown::iid)
+                *out = static_cast<IUnknown*>(this);
+            else if (!(detail::answer<First>(&owner_, id, out) || (detail::answer<Others>(&owner_, id, out) || ...)))
+                return E_NOINTERFACE;
+            static_cast<IUnknown*>(*out)->AddRef();
+            return S_OK;
+        }
+        ULONG AddRef() noexcept override { return references_.fetch_add(1, std::memory_order_relaxed) + 1; }
+        ULONG Release() noexcept override
+        {
+            const ULONG left = references_.fetch_sub(1, std::memory_order_acq_rel) - 1;
+            if (left == 0) delete &owner_;
+            return left;
+        }
+
+    private:
+        aggregatable& owner_;
+        std::atomic<ULONG> references_{1};
+    };
+
+    own_unknown inner_;
+    IUnknown* outer_;
 };
 
 /// The same object for script hosts: methods that take images accept calls that leave optional images out.
