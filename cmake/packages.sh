@@ -35,7 +35,7 @@ need_packages() {
 }
 
 # Parallel compile jobs: the processors there are, but no more than the memory carries (about 1.5 GB each).
-jobs() {
+job_count() {
     processors=$(nproc)
     memory=$(awk '/MemAvailable/ {print int($2 / 1500000)}' /proc/meminfo)
     [ "$memory" -ge "$processors" ] || processors=$memory
