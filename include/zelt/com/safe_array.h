@@ -1,6 +1,7 @@
 // SAFEARRAY: arrays that carry their type and bounds, and `safe_array`, which owns one.
-// The leftmost dimension varies fastest in memory. Elements may be numbers, VT_BSTR, VT_VARIANT, VT_UNKNOWN,
-// VT_DISPATCH.
+// The leftmost dimension varies fastest in memory. Elements may be numbers, VT_BOOL, VT_ERROR, VT_BSTR,
+// VT_VARIANT, VT_UNKNOWN, VT_DISPATCH. Arrays of variants that hold arrays may be nested to any depth. A null array is
+// E_INVALIDARG and a null pointer for a result E_POINTER, where nothing else is said.
 #pragma once
 
 #include "zelt/com/variant.h"
@@ -15,12 +16,14 @@ struct SAFEARRAYBOUND {
 /// Opaque: use the functions.
 struct SAFEARRAY;
 
-/// Zero-filled. Null for no dimensions, an unknown element type, more than 2^31 - 1 elements, or when memory
-/// runs out. bounds[0] is the leftmost dimension.
+/// Zero-filled, the first element aligned to 16 bytes. Null for no or more than 64 dimensions, an unknown element
+/// type, more than 2^31 - 1 elements, an index beyond 32 bits, or when memory runs out. bounds[0] is the leftmost
+/// dimension.
 ZELT_API SAFEARRAY* SafeArrayCreate(VARTYPE type, uint32_t dimensions, const SAFEARRAYBOUND* bounds) noexcept;
 ZELT_API SAFEARRAY* SafeArrayCreateVector(VARTYPE type, int32_t low, uint32_t count) noexcept;
-/// Null is fine. DISP_E_ARRAYISLOCKED while it is accessed.
+/// Null is fine. DISP_E_ARRAYISLOCKED while it, or an array inside it, is accessed; it is untouched then.
 ZELT_API HRESULT SafeArrayDestroy(SAFEARRAY* array) noexcept;
+/// A deep copy; objects are shared. Null copies to null.
 ZELT_API HRESULT SafeArrayCopy(const SAFEARRAY* source, SAFEARRAY** target) noexcept;
 ZELT_API HRESULT SafeArrayGetVartype(const SAFEARRAY* array, VARTYPE* type) noexcept;
 /// 0 for null.
@@ -32,8 +35,10 @@ ZELT_API HRESULT SafeArrayGetUBound(const SAFEARRAY* array, uint32_t dimension, 
 /// Locks and gives the first element's address; UnaccessData undoes it.
 ZELT_API HRESULT SafeArrayAccessData(SAFEARRAY* array, void** data) noexcept;
 ZELT_API HRESULT SafeArrayUnaccessData(SAFEARRAY* array) noexcept;
-/// One index per dimension, leftmost first. Strings, variants and objects are copied or shared.
+/// One index per dimension, leftmost first: DISP_E_BADINDEX outside the bounds. Strings and variants are copied, objects
+/// shared. `value` points to room for an element; what was there is overwritten, not released.
 ZELT_API HRESULT SafeArrayGetElement(SAFEARRAY* array, const int32_t* indices, void* value) noexcept;
+/// `value` points to the element, but is itself the BSTR or the object for those types.
 ZELT_API HRESULT SafeArrayPutElement(SAFEARRAY* array, const int32_t* indices, const void* value) noexcept;
 
 /// Owns an array.
@@ -71,7 +76,8 @@ private:
 };
 
 /// Access to the elements for the length of a scope. Null data for a null array.
-template <class T> class safe_array_access {
+template <class T>
+class safe_array_access {
 public:
     explicit safe_array_access(SAFEARRAY* array) noexcept : array_(array)
     {

@@ -66,23 +66,21 @@ ZELT_API void VariantInit(VARIANT* v) noexcept;
 /// DISP_E_ARRAYISLOCKED for an array in use (both leave the value alone).
 ZELT_API HRESULT VariantClear(VARIANT* v) noexcept;
 /// A deep copy: strings and arrays are copied, objects are shared. The target is cleared first, except when it is
-/// the source. A failure leaves the target empty.
+/// the source. A failure leaves the target empty, unless it could not be cleared: then it is as before.
 ZELT_API HRESULT VariantCopy(VARIANT* target, const VARIANT* source) noexcept;
 /// The same, after following VT_BYREF (and VT_BYREF | VT_VARIANT once).
 ZELT_API HRESULT VariantCopyInd(VARIANT* target, const VARIANT* source) noexcept;
 /// Converts by the automation rules; target may be source. Numbers convert to numbers with a range check
 /// (DISP_E_OVERFLOW); a real number to an integer rounds half to even; NaN to an integer is DISP_E_OVERFLOW;
-/// VT_BOOL is -1 or 0 as a number, any number but 0 is true; strings are read and written in the C locale, the
+/// VT_BOOL is -1 or 0 as a number (all bits set in an unsigned type), any number but 0 is true; strings are read and written in the C locale, the
 /// whole string (blanks around it aside) must be the number, and "True"/"False" in any case for VT_BOOL;
 /// VT_EMPTY converts to 0, false and the empty string; VT_NULL to nothing but itself; VT_ERROR to itself and to
-/// a string; objects convert to VT_UNKNOWN and VT_DISPATCH by query; equal types are copied; anything else is
+/// a string ("Error 2147614724"); objects convert to VT_UNKNOWN and VT_DISPATCH by query; equal types are copied; anything else is
 /// DISP_E_TYPEMISMATCH. VT_BYREF sources are followed. The target is untouched on failure.
-ZELT_API HRESULT VariantChangeType(VARIANT* target, const VARIANT* source, uint16_t flags, VARTYPE type) noexcept;
+ZELT_API HRESULT VariantChangeType(VARIANT* target, const VARIANT* source, uint16_t flags,
+                                   VARTYPE type) noexcept;
 
-constexpr VARIANT empty_variant() noexcept
-{
-    return VARIANT{VT_EMPTY, {}, {.llVal = 0}};
-}
+constexpr VARIANT empty_variant() noexcept { return VARIANT{VT_EMPTY, {}, {.llVal = 0}}; }
 
 /// What an argument looks like that a late-bound caller left out.
 constexpr VARIANT missing_argument() noexcept
@@ -109,8 +107,14 @@ public:
     /// Throws std::bad_alloc.
     ZELT_API variant(const wchar_t* text);
     /// Shares the object: VT_DISPATCH when the pointer is one, else VT_UNKNOWN.
-    variant(IDispatch* object) noexcept : variant() { v_.vt = VT_DISPATCH, v_.pdispVal = com_ptr(object).detach(); }
-    variant(IUnknown* object) noexcept : variant() { v_.vt = VT_UNKNOWN, v_.punkVal = com_ptr(object).detach(); }
+    variant(IDispatch* object) noexcept : variant()
+    {
+        v_.vt = VT_DISPATCH, v_.pdispVal = com_ptr(object).detach();
+    }
+    variant(IUnknown* object) noexcept : variant()
+    {
+        v_.vt = VT_UNKNOWN, v_.punkVal = com_ptr(object).detach();
+    }
     /// A deep copy. Throws std::bad_alloc.
     ZELT_API variant(const variant& other);
     variant(variant&& other) noexcept : v_(std::exchange(other.v_, empty_variant())) {}
