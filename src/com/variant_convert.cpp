@@ -69,7 +69,8 @@ HRESULT store(const number& n, T& out) noexcept
         const double value = n.kind == number::of_signed     ? static_cast<double>(n.i)
                              : n.kind == number::of_unsigned ? static_cast<double>(n.u)
                                                              : n.real;
-        // Half way between the highest float and the next power of two; from there on rounding leaves the type.
+        // Half way between the highest float and the next power of two; from there on rounding leaves the
+        // type.
         constexpr double too_much = 0x1.ffffffp127;
         if (std::is_same_v<T, float> && std::isfinite(value) && std::fabs(value) >= too_much)
             return DISP_E_OVERFLOW;
@@ -153,7 +154,8 @@ HRESULT parse_real(std::string_view digits, bool negative, number* out) noexcept
     return S_OK;
 }
 
-// Integers that are written as such are exact to the last digit; with a fraction or an exponent they are doubles.
+// Integers that are written as such are exact to the last digit; with a fraction or an exponent they are
+// doubles.
 HRESULT parse_integer(std::string_view digits, bool negative, number* out) noexcept
 {
     if (digits.find_first_not_of("0123456789") != digits.npos)

@@ -1,7 +1,7 @@
 // SAFEARRAY: arrays that carry their type and bounds, and `safe_array`, which owns one.
 // The leftmost dimension varies fastest in memory. Elements may be numbers, VT_BOOL, VT_ERROR, VT_BSTR,
-// VT_VARIANT, VT_UNKNOWN, VT_DISPATCH. Arrays of variants that hold arrays may be nested to any depth. A null array is
-// E_INVALIDARG and a null pointer for a result E_POINTER, where nothing else is said.
+// VT_VARIANT, VT_UNKNOWN, VT_DISPATCH. Arrays of variants that hold arrays may be nested to any depth. A null
+// array is E_INVALIDARG and a null pointer for a result E_POINTER, where nothing else is said.
 #pragma once
 
 #include "zelt/com/variant.h"
@@ -16,9 +16,9 @@ struct SAFEARRAYBOUND {
 /// Opaque: use the functions.
 struct SAFEARRAY;
 
-/// Zero-filled, the first element aligned to 16 bytes. Null for no or more than 64 dimensions, an unknown element
-/// type, more than 2^31 - 1 elements, an index beyond 32 bits, or when memory runs out. bounds[0] is the leftmost
-/// dimension.
+/// Zero-filled, the first element aligned to 16 bytes. Null for no or more than 64 dimensions, an unknown
+/// element type, more than 2^31 - 1 elements, an index beyond 32 bits, or when memory runs out. bounds[0] is
+/// the leftmost dimension.
 ZELT_API SAFEARRAY* SafeArrayCreate(VARTYPE type, uint32_t dimensions, const SAFEARRAYBOUND* bounds) noexcept;
 ZELT_API SAFEARRAY* SafeArrayCreateVector(VARTYPE type, int32_t low, uint32_t count) noexcept;
 /// Null is fine. DISP_E_ARRAYISLOCKED while it, or an array inside it, is accessed; it is untouched then.
@@ -35,8 +35,9 @@ ZELT_API HRESULT SafeArrayGetUBound(const SAFEARRAY* array, uint32_t dimension, 
 /// Locks and gives the first element's address; UnaccessData undoes it.
 ZELT_API HRESULT SafeArrayAccessData(SAFEARRAY* array, void** data) noexcept;
 ZELT_API HRESULT SafeArrayUnaccessData(SAFEARRAY* array) noexcept;
-/// One index per dimension, leftmost first: DISP_E_BADINDEX outside the bounds. Strings and variants are copied, objects
-/// shared. `value` points to room for an element; what was there is overwritten, not released.
+/// One index per dimension, leftmost first: DISP_E_BADINDEX outside the bounds. Strings and variants are
+/// copied, objects shared. `value` points to room for an element; what was there is overwritten, not
+/// released.
 ZELT_API HRESULT SafeArrayGetElement(SAFEARRAY* array, const int32_t* indices, void* value) noexcept;
 /// `value` points to the element, but is itself the BSTR or the object for those types.
 ZELT_API HRESULT SafeArrayPutElement(SAFEARRAY* array, const int32_t* indices, const void* value) noexcept;

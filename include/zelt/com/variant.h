@@ -34,7 +34,8 @@ enum : VARTYPE {
     VT_TYPEMASK = 0x0fff,
 };
 
-/// A value with its type. With VT_BYREF, `byref` points to a value of the type; with VT_ARRAY, `parray` is held.
+/// A value with its type. With VT_BYREF, `byref` points to a value of the type; with VT_ARRAY, `parray` is
+/// held.
 struct VARIANT {
     VARTYPE vt;
     uint16_t reserved[3];
@@ -62,21 +63,22 @@ struct VARIANT {
 };
 
 ZELT_API void VariantInit(VARIANT* v) noexcept;
-/// Frees what the value owns and makes it empty. E_INVALIDARG for null, DISP_E_BADVARTYPE for an unknown type,
-/// DISP_E_ARRAYISLOCKED for an array in use (both leave the value alone).
+/// Frees what the value owns and makes it empty. E_INVALIDARG for null, DISP_E_BADVARTYPE for an unknown
+/// type, DISP_E_ARRAYISLOCKED for an array in use (both leave the value alone).
 ZELT_API HRESULT VariantClear(VARIANT* v) noexcept;
-/// A deep copy: strings and arrays are copied, objects are shared. The target is cleared first, except when it is
-/// the source. A failure leaves the target empty, unless it could not be cleared: then it is as before.
+/// A deep copy: strings and arrays are copied, objects are shared. The target is cleared first, except when
+/// it is the source. A failure leaves the target empty, unless it could not be cleared: then it is as before.
 ZELT_API HRESULT VariantCopy(VARIANT* target, const VARIANT* source) noexcept;
 /// The same, after following VT_BYREF (and VT_BYREF | VT_VARIANT once).
 ZELT_API HRESULT VariantCopyInd(VARIANT* target, const VARIANT* source) noexcept;
 /// Converts by the automation rules; target may be source. Numbers convert to numbers with a range check
 /// (DISP_E_OVERFLOW); a real number to an integer rounds half to even; NaN to an integer is DISP_E_OVERFLOW;
-/// VT_BOOL is -1 or 0 as a number (all bits set in an unsigned type), any number but 0 is true; strings are read and written in the C locale, the
-/// whole string (blanks around it aside) must be the number, and "True"/"False" in any case for VT_BOOL;
-/// VT_EMPTY converts to 0, false and the empty string; VT_NULL to nothing but itself; VT_ERROR to itself and to
-/// a string ("Error 2147614724"); objects convert to VT_UNKNOWN and VT_DISPATCH by query; equal types are copied; anything else is
-/// DISP_E_TYPEMISMATCH. VT_BYREF sources are followed. The target is untouched on failure.
+/// VT_BOOL is -1 or 0 as a number (all bits set in an unsigned type), any number but 0 is true; strings are
+/// read and written in the C locale, the whole string (blanks around it aside) must be the number, and
+/// "True"/"False" in any case for VT_BOOL; VT_EMPTY converts to 0, false and the empty string; VT_NULL to
+/// nothing but itself; VT_ERROR to itself and to a string ("Error 2147614724"); objects convert to VT_UNKNOWN
+/// and VT_DISPATCH by query; equal types are copied; anything else is DISP_E_TYPEMISMATCH. VT_BYREF sources
+/// are followed. The target is untouched on failure.
 ZELT_API HRESULT VariantChangeType(VARIANT* target, const VARIANT* source, uint16_t flags,
                                    VARTYPE type) noexcept;
 
