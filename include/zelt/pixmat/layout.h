@@ -44,7 +44,7 @@ struct image_layout {
 /// A y stride beyond 32 bits keeps its low bits; the image factory refuses such sizes.
 constexpr image_layout packed_layout(int32_t width, int32_t height, int32_t bits, PixmatEncoding encoding)
 {
-    const int32_t x_stride = (bits / 8) + (bits % 8 > 0 ? 1 : 0);
+    const auto x_stride = static_cast<int32_t>((int64_t{bits} + 7) / 8);
     const auto y_stride = static_cast<int32_t>(static_cast<uint32_t>(int64_t{x_stride} * width));
     return {width, height, bits, encoding, 0, x_stride, y_stride};
 }

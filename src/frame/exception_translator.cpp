@@ -1,0 +1,101 @@
+#include "frame/exception_translator.h"
+
+#include "frame/errors.h"
+#include "zelt/com/error_info.h"
+
+#include <mutex>
+
+namespace Qor {
+namespace {
+
+HResultException with_text(HRESULT code, const std::exception& e)
+{
+    return {code, e.what()};
+}
+
+HResultException from_error_object(const com_error& e)
+{
+    HResultException failure(e.code());
+    IErrorInfo* info = e.info();
+    if (!info) return failure;
+    bstr text;
+    if (succeeded(info->GetSource(text.put()))) failure.source = text.view();
+    if (succeeded(info->GetDescription(text.put()))) failure.description = text.view();
+    if (succeeded(info->GetHelpFile(text.put()))) failure.helpFile = text.view();
+    uint32_t context = 0;
+    if (succeeded(info->GetHelpContext(&context))) failure.helpContext = context;
+    return failure;
+}
+
+HRESULT of_system(int32_t code)
+{
+    return code <= 0 ? code : make_hresult((static_cast<uint32_t>(code) & 0xFFFF) | 0x80070000);
+}
+
+HResultException of_exception(const std::exception& e)
+{
+    return with_text(E_FAIL, e);
+}
+HResultException of_argument(const std::exception& e)
+{
+    return with_text(E_INVALIDARG, e);
+}
+HResultException of_memory(const std::exception& e)
+{
+    return with_text(E_OUTOFMEMORY, e);
+}
+HResultException of_system_error(const win32_error& e)
+{
+    return with_text(of_system(e.code()), e);
+}
+HResultException of_code_error(const code_error& e)
+{
+    return HResultException(e.code());
+}
+HResultException of_code(const HRESULT& code)
+{
+    return HResultException(code);
+}
+HResultException itself(const HResultException& e)
+{
+    return e;
+}
+
+template <class E, class Argument = E> using element = ExceptionTranslator<E, HResultException (*)(const Argument&)>;
+
+/// The innermost element has the first word, so the most general type stands outermost. Members are made in this
+/// order: each refers to the one before it. Nothing is allocated, for the chain may be wanted first when memory is out.
+struct chain {
+    ExceptionTranslatorTail tail;
+    element<win32_error> system_errors{of_system_error, tail};
+    element<HRESULT> codes{of_code, system_errors};
+    element<code_error> code_errors{of_code_error, codes};
+    element<HResultException> translated{itself, code_errors};
+    element<com_error> com_errors{from_error_object, translated};
+    element<std::bad_alloc, std::exception> memory{of_memory, com_errors};
+    element<std::out_of_range, std::exception> ranges{of_argument, memory};
+    element<std::invalid_argument, std::exception> arguments{of_argument, ranges};
+    element<std::bad_cast, std::exception> casts{of_argument, arguments};
+    element<std::exception> outermost{of_exception, casts};
+};
+
+std::mutex& chain_mutex()
+{
+    static std::mutex m;
+    return m;
+}
+
+} // namespace
+
+HResultException TranslateCurrentException()
+{
+    try {
+        const std::lock_guard lock(chain_mutex());
+        static const chain translators;
+        return translators.outermost.translate();
+    } catch (...) {
+        return HResultException(E_UNEXPECTED);
+    }
+}
+
+} // namespace Qor

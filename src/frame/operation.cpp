@@ -1,0 +1,14 @@
+#include "frame/operation.h"
+
+namespace Qor::Luxar::ZELT {
+
+HRESULT detail::run_frame(const GUID& interface_id, HRESULT (*body)(void*), void* context) noexcept
+{
+    try {
+        return body(context);
+    } catch (...) {
+        return ReportCurrentException(interface_id);
+    }
+}
+
+} // namespace Qor::Luxar::ZELT
