@@ -28,29 +28,22 @@ struct argument_name {
     double default_number;
 };
 
-constexpr argument_name in(const char* name)
-{
-    return {name, direction::in, false, 0};
-}
+constexpr argument_name in(const char* name) { return {name, direction::in, false, 0}; }
 constexpr argument_name opt(const char* name, double default_number = 0)
 {
     return {name, direction::in, true, default_number};
 }
-constexpr argument_name out(const char* name)
-{
-    return {name, direction::out, false, 0};
-}
-constexpr argument_name result(const char* name)
-{
-    return {name, direction::result, false, 0};
-}
+constexpr argument_name out(const char* name) { return {name, direction::out, false, 0}; }
+constexpr argument_name result(const char* name) { return {name, direction::result, false, 0}; }
 
 namespace detail {
 
 /// How one C++ argument type travels in a VARIANT slot: its tag, its spelling, a value to pass, a value to take back.
-template <class T> struct carried;
+template <class T>
+struct carried;
 
-template <class T, VARTYPE Tag, auto Member> struct carried_number {
+template <class T, VARTYPE Tag, auto Member>
+struct carried_number {
     static constexpr VARTYPE type = Tag;
     static constexpr const GUID* interface_id = nullptr;
     static constexpr const enumeration_info* enumeration = nullptr;
@@ -61,9 +54,10 @@ template <class T, VARTYPE Tag, auto Member> struct carried_number {
         slot.*Member = value;
     }
 };
-#define ZELT_CARRIED(T, tag, member, spelling)                                                                \
-    template <> struct carried<T> : carried_number<T, tag, &VARIANT::member> {                                \
-        static constexpr const char* spelled = spelling;                                                      \
+#define ZELT_CARRIED(T, tag, member, spelling)                                                               \
+    template <>                                                                                              \
+    struct carried<T> : carried_number<T, tag, &VARIANT::member> {                                           \
+        static constexpr const char* spelled = spelling;                                                     \
     }
 ZELT_CARRIED(int32_t, VT_I4, lVal, "long");
 ZELT_CARRIED(uint32_t, VT_UI4, ulVal, "unsigned long");
@@ -89,7 +83,8 @@ struct carried<E> {
     }
 };
 
-template <> struct carried<VARIANT> {
+template <>
+struct carried<VARIANT> {
     static constexpr VARTYPE type = VT_VARIANT;
     static constexpr const char* spelled = "VARIANT";
     static constexpr const GUID* interface_id = nullptr;
@@ -98,7 +93,8 @@ template <> struct carried<VARIANT> {
     static void set(VARIANT& slot, const VARIANT& value) noexcept { slot = value; }
 };
 
-template <> struct carried<SAFEARRAY*> {
+template <>
+struct carried<SAFEARRAY*> {
     static constexpr VARTYPE type = VT_ARRAY;
     static constexpr const char* spelled = "SAFEARRAY";
     static constexpr const GUID* interface_id = nullptr;
@@ -128,16 +124,26 @@ struct carried<I*> {
     }
 };
 
-template <class T> struct is_out : std::false_type {};
-template <class T> struct is_out<T*> : std::true_type {};
+template <class T>
+struct is_out : std::false_type {
+};
+template <class T>
+struct is_out<T*> : std::true_type {
+};
 template <class I>
     requires std::is_base_of_v<IUnknown, I>
-struct is_out<I*> : std::false_type {};
-template <> struct is_out<BSTR> : std::false_type {};
-template <> struct is_out<SAFEARRAY*> : std::false_type {};
+struct is_out<I*> : std::false_type {
+};
+template <>
+struct is_out<BSTR> : std::false_type {
+};
+template <>
+struct is_out<SAFEARRAY*> : std::false_type {
+};
 
 /// Holds one argument for the length of a call and hands results back to the slot.
-template <class T> struct held {
+template <class T>
+struct held {
     explicit held(VARIANT& slot) noexcept : value(carried<T>::get(slot)) {}
     T pass() noexcept { return value; }
     T value;
@@ -157,7 +163,8 @@ private:
     value_type value_{};
 };
 
-template <class T> struct bare {
+template <class T>
+struct bare {
     using type = T;
 };
 template <class T>
@@ -166,8 +173,10 @@ struct bare<T> {
     using type = std::remove_pointer_t<T>;
 };
 
-template <auto Member> struct member;
-template <class I, class... Args, HRESULT (I::*Member)(Args...) noexcept> struct member<Member> {
+template <auto Member>
+struct member;
+template <class I, class... Args, HRESULT (I::*Member)(Args...) noexcept>
+struct member<Member> {
     static constexpr size_t arity = sizeof...(Args);
 
     static HRESULT call(IUnknown* self, VARIANT* slots) noexcept
@@ -187,25 +196,29 @@ template <class I, class... Args, HRESULT (I::*Member)(Args...) noexcept> struct
     }
 
 private:
-    template <size_t... N> static HRESULT call(I* self, VARIANT* slots, std::index_sequence<N...>) noexcept
+    template <size_t... N>
+    static HRESULT call(I* self, VARIANT* slots, std::index_sequence<N...>) noexcept
     {
-        return [self](held<Args>&&... arguments) noexcept { return (self->*Member)(arguments.pass()...); }(
-            held<Args>(slots[N])...);
+        return [self](held<Args>&&... arguments) noexcept {
+            return (self->*Member)(arguments.pass()...);
+        }(held<Args>(slots[N])...);
     }
 
-    template <class T> static constexpr argument_info describe(const argument_name& n)
+    template <class T>
+    static constexpr argument_info describe(const argument_name& n)
     {
         if ((n.way != direction::in) != is_out<T>::value) throw "in, out or result does not fit the C++ type";
         using c = carried<typename bare<T>::type>;
-        return {n.name,    c::spelled,     c::type, n.way, n.optional, n.default_number,
-                c::interface_id, c::enumeration};
+        return {n.name,     c::spelled,       c::type,         n.way,
+                n.optional, n.default_number, c::interface_id, c::enumeration};
     }
 };
 
 } // namespace detail
 
 /// One row, with its arguments.
-template <size_t Arity> struct method_row {
+template <size_t Arity>
+struct method_row {
     const char* name;
     const char* help;
     uint16_t kind;
@@ -216,7 +229,8 @@ template <size_t Arity> struct method_row {
 
 namespace detail {
 
-template <auto Member> std::array<unsigned char, 16> member_bytes() noexcept
+template <auto Member>
+std::array<unsigned char, 16> member_bytes() noexcept
 {
     std::array<unsigned char, 16> bytes{};
     const auto pointer = Member;
@@ -229,25 +243,29 @@ template <auto Member, class... Names>
 constexpr auto row(uint16_t kind, const char* name, const char* help, Names... names)
 {
     static_assert(sizeof...(Names) == member<Member>::arity, "one name for each argument, in order");
-    return method_row<sizeof...(Names)>{name,
-                                        help,
-                                        kind,
-                                        member<Member>::describe(std::array<argument_name, sizeof...(Names)>{names...}),
-                                        &member<Member>::call,
-                                        &member_bytes<Member>};
+    return method_row<sizeof...(Names)>{
+        name,
+        help,
+        kind,
+        member<Member>::describe(std::array<argument_name, sizeof...(Names)>{names...}),
+        &member<Member>::call,
+        &member_bytes<Member>};
 }
 
 } // namespace detail
 
-template <auto Member, class... Names> constexpr auto method(const char* name, const char* help, Names... names)
+template <auto Member, class... Names>
+constexpr auto method(const char* name, const char* help, Names... names)
 {
     return detail::row<Member>(DISPATCH_METHOD, name, help, names...);
 }
-template <auto Member, class... Names> constexpr auto get(const char* name, const char* help, Names... names)
+template <auto Member, class... Names>
+constexpr auto get(const char* name, const char* help, Names... names)
 {
     return detail::row<Member>(DISPATCH_PROPERTYGET, name, help, names...);
 }
-template <auto Member, class... Names> constexpr auto put(const char* name, const char* help, Names... names)
+template <auto Member, class... Names>
+constexpr auto put(const char* name, const char* help, Names... names)
 {
     return detail::row<Member>(DISPATCH_PROPERTYPUT, name, help, names...);
 }
@@ -260,7 +278,8 @@ constexpr DISPID well_known_id(const char* name) noexcept
 }
 
 /// The table of one interface. `Rows` is a tuple of rows with static storage.
-template <class Interface, const auto& Rows> class interface_table {
+template <class Interface, const auto& Rows>
+class interface_table {
 public:
     static const interface_info& info(const char* help) noexcept
     {
@@ -272,7 +291,8 @@ public:
 private:
     static constexpr size_t count = std::tuple_size_v<std::remove_cvref_t<decltype(Rows)>>;
 
-    template <size_t... N> static std::array<method_info, count> build(std::index_sequence<N...>) noexcept
+    template <size_t... N>
+    static std::array<method_info, count> build(std::index_sequence<N...>) noexcept
     {
         std::array<method_info, count> methods{describe(std::get<N>(Rows))...};
         for (size_t i = 0; i < count; ++i) {
@@ -284,7 +304,8 @@ private:
         return methods;
     }
 
-    template <size_t Arity> static method_info describe(const method_row<Arity>& row) noexcept
+    template <size_t Arity>
+    static method_info describe(const method_row<Arity>& row) noexcept
     {
         method_info m{row.name, row.help, 0, row.kind, false, row.arguments, row.call, {}};
         for (const argument_info& a : row.arguments)

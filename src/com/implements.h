@@ -13,7 +13,8 @@ namespace Qor {
 namespace detail {
 
 /// The pointer to an interface that answers to an identifier, itself or by what it extends.
-template <class Interface, class Object> bool answer(Object* object, const GUID& id, void** out) noexcept
+template <class Interface, class Object>
+bool answer(Object* object, const GUID& id, void** out) noexcept
 {
     if (id == Interface::iid) {
         *out = static_cast<Interface*>(object);
@@ -28,7 +29,8 @@ template <class Interface, class Object> bool answer(Object* object, const GUID&
 } // namespace detail
 
 /// A counted object with these interfaces. It starts with one reference; see make().
-template <class First, class... Others> class implements : public First, public Others... {
+template <class First, class... Others>
+class implements : public First, public Others... {
 public:
     HRESULT QueryInterface(const GUID& id, void** out) noexcept override
     {
@@ -60,10 +62,12 @@ private:
 };
 
 /// The description of an interface; each is defined beside its table.
-template <class Interface> const interface_info& table_of() noexcept;
+template <class Interface>
+const interface_info& table_of() noexcept;
 
 /// Late binding for an object whose first interface is dual and described by a table.
-template <class Base, class First> class dispatching : public Base {
+template <class Base, class First>
+class dispatching : public Base {
 public:
     using Base::Base;
 
@@ -92,8 +96,12 @@ public:
 };
 
 /// Says that failures of the main interface leave error information.
-template <class First> struct error_support : ISupportErrorInfo {
-    HRESULT InterfaceSupportsErrorInfo(const GUID& id) noexcept override { return id == First::iid ? S_OK : S_FALSE; }
+template <class First>
+struct error_support : ISupportErrorInfo {
+    HRESULT InterfaceSupportsErrorInfo(const GUID& id) noexcept override
+    {
+        return id == First::iid ? S_OK : S_FALSE;
+    }
 };
 
 /// Safe for untrusted callers and untrusted data, always.
@@ -113,9 +121,13 @@ using automation = dispatching<implements<First, Others..., error_support<First>
 
 /// Like implements, for objects that may become part of an outer object. The outer one then answers for identity
 /// and counts references; it holds this object by inner().
-template <class First, class... Others> class aggregatable : public First, public Others... {
+template <class First, class... Others>
+class aggregatable : public First, public Others... {
 public:
-    HRESULT QueryInterface(const GUID& id, void** out) noexcept override { return outer_->QueryInterface(id, out); }
+    HRESULT QueryInterface(const GUID& id, void** out) noexcept override
+    {
+        return outer_->QueryInterface(id, out);
+    }
     ULONG AddRef() noexcept override { return outer_->AddRef(); }
     ULONG Release() noexcept override { return outer_->Release(); }
 
@@ -139,7 +151,8 @@ private:
             *out = nullptr;
             if (id == IUnknown::iid)
                 *out = static_cast<IUnknown*>(this);
-            else if (!(detail::answer<First>(&owner_, id, out) || (detail::answer<Others>(&owner_, id, out) || ...)))
+            else if (!(detail::answer<First>(&owner_, id, out) ||
+                       (detail::answer<Others>(&owner_, id, out) || ...)))
                 return E_NOINTERFACE;
             static_cast<IUnknown*>(*out)->AddRef();
             return S_OK;
@@ -162,7 +175,8 @@ private:
 };
 
 /// The same object for script hosts: methods that take images accept calls that leave optional images out.
-template <class Base> class scripting : public Base {
+template <class Base>
+class scripting : public Base {
 public:
     using Base::Base;
 
@@ -176,17 +190,15 @@ public:
 };
 
 /// A new object, or std::bad_alloc, or what its constructor throws.
-template <class T, class... Args> com_ptr<T> make(Args&&... args)
+template <class T, class... Args>
+com_ptr<T> make(Args&&... args)
 {
     return com_ptr<T>::attach(new T(std::forward<Args>(args)...));
 }
 
 /// A new object whose constructor cannot throw; null when memory runs out.
 template <class T, class... Args>
-    requires std::is_nothrow_constructible_v<T, Args...>
-com_ptr<T> try_make(Args&&... args) noexcept
-{
-    return com_ptr<T>::attach(new (std::nothrow) T(std::forward<Args>(args)...));
-}
+    requires std::is_nothrow_constructible_v<T, Args...> com_ptr<T> try_make(Args&&... args)
+noexcept { return com_ptr<T>::attach(new (std::nothrow) T(std::forward<Args>(args)...)); }
 
 } // namespace Qor

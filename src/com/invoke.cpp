@@ -44,7 +44,9 @@ bool get_object(const VARIANT& v, IUnknown** object) noexcept
     case VT_UNKNOWN:
     case VT_DISPATCH: *object = value.punkVal; return true;
     case VT_BYREF | VT_UNKNOWN:
-    case VT_BYREF | VT_DISPATCH: *object = value.byref ? *static_cast<IUnknown**>(value.byref) : nullptr; return true;
+    case VT_BYREF | VT_DISPATCH:
+        *object = value.byref ? *static_cast<IUnknown**>(value.byref) : nullptr;
+        return true;
     default: return false;
     }
 }
@@ -53,7 +55,8 @@ bool get_array(const VARIANT& v, SAFEARRAY** array) noexcept
 {
     const VARIANT& value = follow(v);
     if (!(value.vt & VT_ARRAY)) return false;
-    *array = value.vt & VT_BYREF ? (value.byref ? *static_cast<SAFEARRAY**>(value.byref) : nullptr) : value.parray;
+    *array =
+        value.vt & VT_BYREF ? (value.byref ? *static_cast<SAFEARRAY**>(value.byref) : nullptr) : value.parray;
     return *array != nullptr;
 }
 
@@ -220,8 +223,8 @@ private:
 HRESULT match(const method_info& m, const DISPPARAMS& p, std::array<const VARIANT*, most_arguments>& given,
               uint32_t* bad_argument) noexcept
 {
-    const auto visible = static_cast<uint32_t>(
-        std::ranges::count_if(m.arguments, [](const argument_info& a) { return a.way != direction::result; }));
+    const auto visible = static_cast<uint32_t>(std::ranges::count_if(
+        m.arguments, [](const argument_info& a) { return a.way != direction::result; }));
     if (p.cArgs > visible || p.cNamedArgs > p.cArgs) return DISP_E_BADPARAMCOUNT;
     if ((p.cArgs && !p.rgvarg) || (p.cNamedArgs && !p.rgdispidNamedArgs)) return E_POINTER;
     std::array<size_t, most_arguments> place{}; // of the visible arguments
@@ -244,7 +247,8 @@ HRESULT match(const method_info& m, const DISPPARAMS& p, std::array<const VARIAN
 
 } // namespace
 
-HRESULT invoke(const interface_info& table, IUnknown* self, invoke_form form, const invoke_request& request) noexcept
+HRESULT invoke(const interface_info& table, IUnknown* self, invoke_form form,
+               const invoke_request& request) noexcept
 {
     const method_info* m = find(table, request.id, request.flags);
     if (!m) return DISP_E_MEMBERNOTFOUND;
@@ -258,7 +262,8 @@ HRESULT invoke(const interface_info& table, IUnknown* self, invoke_form form, co
     for (size_t i = 0; i < m->arguments.size(); ++i) {
         if (m->arguments[i].way == direction::result) continue;
         if (const HRESULT hr = frame.place(i, given[i]); failed(hr)) {
-            if (request.bad_argument && given[i]) *request.bad_argument = static_cast<uint32_t>(given[i] - params.rgvarg);
+            if (request.bad_argument && given[i])
+                *request.bad_argument = static_cast<uint32_t>(given[i] - params.rgvarg);
             return hr;
         }
     }

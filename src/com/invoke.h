@@ -23,7 +23,8 @@ enum class invoke_form { standard, scripting };
 
 /// `self` is the described interface. A method that fails answers DISP_E_EXCEPTION with the thread's error
 /// information in the exception record.
-HRESULT invoke(const interface_info& table, IUnknown* self, invoke_form form, const invoke_request& request) noexcept;
+HRESULT invoke(const interface_info& table, IUnknown* self, invoke_form form,
+               const invoke_request& request) noexcept;
 
 /// names[0] is a method or property, the others its arguments; case does not matter. Unknown ones get DISPID_UNKNOWN
 /// and the answer is DISP_E_UNKNOWNNAME.

@@ -17,8 +17,8 @@ HResultException::HResultException(HRESULT code, const std::string& text)
 {
 }
 
-HResultException::HResultException(HRESULT code, std::wstring error_source, std::wstring text, std::wstring help_file,
-                                   uint32_t help_context)
+HResultException::HResultException(HRESULT code, std::wstring error_source, std::wstring text,
+                                   std::wstring help_file, uint32_t help_context)
     : std::runtime_error(""), hresult(code), source(std::move(error_source)), description(std::move(text)),
       helpFile(std::move(help_file)), helpContext(help_context)
 {
@@ -86,7 +86,8 @@ void CheckHResult::raise(HRESULT code, const std::wstring& description)
         if (failure.source.empty() && succeeded(info->GetSource(text.put()))) failure.source = text.view();
         if (failure.description.empty() && succeeded(info->GetDescription(text.put())))
             failure.description = text.view();
-        if (failure.helpFile.empty() && succeeded(info->GetHelpFile(text.put()))) failure.helpFile = text.view();
+        if (failure.helpFile.empty() && succeeded(info->GetHelpFile(text.put())))
+            failure.helpFile = text.view();
         info->GetHelpContext(&failure.helpContext);
     }
     throw failure;
@@ -95,11 +96,12 @@ void CheckHResult::raise(HRESULT code, const std::wstring& description)
 std::string detail::bad_enum_text(const std::type_info& to, const std::type_info& from, int64_t value)
 {
     const auto spelled = [](const std::type_info& t) {
-        const std::unique_ptr<char, void (*)(void*)> name(abi::__cxa_demangle(t.name(), nullptr, nullptr, nullptr),
-                                                          std::free);
+        const std::unique_ptr<char, void (*)(void*)> name(
+            abi::__cxa_demangle(t.name(), nullptr, nullptr, nullptr), std::free);
         return std::string(name ? name.get() : t.name());
     };
-    return "bad_enum_cast: enum_cast<" + spelled(to) + ">(" + spelled(from) + "(" + std::to_string(value) + "))";
+    return "bad_enum_cast: enum_cast<" + spelled(to) + ">(" + spelled(from) + "(" + std::to_string(value) +
+           "))";
 }
 
 } // namespace Qor

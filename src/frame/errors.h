@@ -23,7 +23,10 @@ private:
 /// Carries a result code and the error object that came with it.
 class com_error {
 public:
-    explicit com_error(HRESULT code, com_ptr<IErrorInfo> info = {}) noexcept : code_(code), info_(std::move(info)) {}
+    explicit com_error(HRESULT code, com_ptr<IErrorInfo> info = {}) noexcept
+        : code_(code), info_(std::move(info))
+    {
+    }
     HRESULT code() const noexcept { return code_; }
     IErrorInfo* info() const noexcept { return info_.get(); }
 
@@ -68,7 +71,8 @@ namespace detail {
 std::string bad_enum_text(const std::type_info& to, const std::type_info& from, int64_t value);
 }
 
-template <class From, class To> class enum_cast_exception : public bad_enum_cast {
+template <class From, class To>
+class enum_cast_exception : public bad_enum_cast {
 public:
     explicit enum_cast_exception(From value) noexcept : value_(value) {}
     From value() const noexcept { return value_; }
@@ -77,7 +81,8 @@ public:
     const char* what() const noexcept override
     {
         try {
-            if (text_.empty()) text_ = detail::bad_enum_text(typeid(To), typeid(From), static_cast<int64_t>(value_));
+            if (text_.empty())
+                text_ = detail::bad_enum_text(typeid(To), typeid(From), static_cast<int64_t>(value_));
             return text_.c_str();
         } catch (...) {
             return bad_enum_cast::what();
@@ -91,7 +96,8 @@ private:
 
 /// A scripts' enumeration as the kernel's own, whose values have the same numbers. Values that the scripts'
 /// enumeration does not list throw enum_cast_exception.
-template <class To, class From> To enum_cast(From value)
+template <class To, class From>
+To enum_cast(From value)
 {
     const auto& known = enumeration_of<From>::info.values;
     const auto number = static_cast<int32_t>(value);

@@ -8,10 +8,7 @@
 namespace Qor {
 namespace {
 
-HResultException with_text(HRESULT code, const std::exception& e)
-{
-    return {code, e.what()};
-}
+HResultException with_text(HRESULT code, const std::exception& e) { return {code, e.what()}; }
 
 HResultException from_error_object(const com_error& e)
 {
@@ -32,36 +29,16 @@ HRESULT of_system(int32_t code)
     return code <= 0 ? code : make_hresult((static_cast<uint32_t>(code) & 0xFFFF) | 0x80070000);
 }
 
-HResultException of_exception(const std::exception& e)
-{
-    return with_text(E_FAIL, e);
-}
-HResultException of_argument(const std::exception& e)
-{
-    return with_text(E_INVALIDARG, e);
-}
-HResultException of_memory(const std::exception& e)
-{
-    return with_text(E_OUTOFMEMORY, e);
-}
-HResultException of_system_error(const win32_error& e)
-{
-    return with_text(of_system(e.code()), e);
-}
-HResultException of_code_error(const code_error& e)
-{
-    return HResultException(e.code());
-}
-HResultException of_code(const HRESULT& code)
-{
-    return HResultException(code);
-}
-HResultException itself(const HResultException& e)
-{
-    return e;
-}
+HResultException of_exception(const std::exception& e) { return with_text(E_FAIL, e); }
+HResultException of_argument(const std::exception& e) { return with_text(E_INVALIDARG, e); }
+HResultException of_memory(const std::exception& e) { return with_text(E_OUTOFMEMORY, e); }
+HResultException of_system_error(const win32_error& e) { return with_text(of_system(e.code()), e); }
+HResultException of_code_error(const code_error& e) { return HResultException(e.code()); }
+HResultException of_code(const HRESULT& code) { return HResultException(code); }
+HResultException itself(const HResultException& e) { return e; }
 
-template <class E, class Argument = E> using element = ExceptionTranslator<E, HResultException (*)(const Argument&)>;
+template <class E, class Argument = E>
+using element = ExceptionTranslator<E, HResultException (*)(const Argument&)>;
 
 /// The innermost element has the first word, so the most general type stands outermost. Members are made in this
 /// order: each refers to the one before it. Nothing is allocated, for the chain may be wanted first when memory is out.

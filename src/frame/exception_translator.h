@@ -21,7 +21,8 @@ public:
 };
 
 /// Lets the elements behind it try first; an exception of type E that comes back is its own.
-template <class E, class F> class ExceptionTranslator final : public ExceptionTranslatorBase {
+template <class E, class F>
+class ExceptionTranslator final : public ExceptionTranslatorBase {
 public:
     ExceptionTranslator(F translate_one, const ExceptionTranslatorBase& next)
         : translate_one_(std::move(translate_one)), next_(next)

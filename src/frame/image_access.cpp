@@ -14,10 +14,7 @@ image_layout layout_of(IPixmat2* image)
     return layout;
 }
 
-memory_2d open(IPixmat2* image, IPixmatLock* lock)
-{
-    return view_of(layout_of(image), lock->Data(0));
-}
+memory_2d open(IPixmat2* image, IPixmatLock* lock) { return view_of(layout_of(image), lock->Data(0)); }
 
 com_ptr<IPixmatDescriptor> make_descriptor(const image_layout& layout)
 {
@@ -89,7 +86,8 @@ HRESULT CreateImageFromLayout(const image_layout& layout, IPixmat2** out) noexce
 ImageWriteAccess CreateImageOfType(size s, pixel_type type)
 {
     const com_ptr<IPixmat2> image =
-        create(packed_layout(s.width, s.height, GetPixmatBits(type), GetPixmatEncoding(type)), PixmatCreateMode_Packed);
+        create(packed_layout(s.width, s.height, GetPixmatBits(type), GetPixmatEncoding(type)),
+               PixmatCreateMode_Packed);
     return ImageWriteAccess(image.get());
 }
 

@@ -59,13 +59,15 @@ ImageWriteAccess ResolveOutputSized(IPixmat2* input, IPixmat2* out, size s);
 ImageWriteAccess ResolveOutputTyped(IPixmat2* out, size s, pixel_type type);
 
 /// A new object of a creatable class. Failures throw with the description "CoCreateInstance({...})".
-template <class Interface> com_ptr<Interface> create_instance(const GUID& class_id);
+template <class Interface>
+com_ptr<Interface> create_instance(const GUID& class_id);
 
 namespace detail {
 void create_instance(const GUID& class_id, const GUID& interface_id, void** out);
 }
 
-template <class Interface> com_ptr<Interface> create_instance(const GUID& class_id)
+template <class Interface>
+com_ptr<Interface> create_instance(const GUID& class_id)
 {
     com_ptr<Interface> object;
     detail::create_instance(class_id, Interface::iid, object.put_void());

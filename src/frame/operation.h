@@ -11,17 +11,20 @@ HRESULT run_frame(const GUID& interface_id, HRESULT (*body)(void*), void* contex
 }
 
 /// Runs a body that answers a code; whatever it throws becomes a code with error information.
-template <class Body> HRESULT run_frame(const GUID& interface_id, Body&& body) noexcept
+template <class Body>
+HRESULT run_frame(const GUID& interface_id, Body&& body) noexcept
 {
     return detail::run_frame(
         interface_id,
-        [](void* context) -> HRESULT { return (*static_cast<std::remove_reference_t<Body>*>(context))(); }, &body);
+        [](void* context) -> HRESULT { return (*static_cast<std::remove_reference_t<Body>*>(context))(); },
+        &body);
 }
 
 /// A method whose result is an image. The body resolves the output, then the inputs, runs its kernel and returns the
 /// output's access. Committed and handed out with a reference added; a null result pointer is E_POINTER, but only after
 /// the work is done.
-template <class Interface, class Body> HRESULT image_method(IPixmat2** result, Body&& body) noexcept
+template <class Interface, class Body>
+HRESULT image_method(IPixmat2** result, Body&& body) noexcept
 {
     return run_frame(Interface::iid, [&]() -> HRESULT {
         ImageWriteAccess dst = body();
@@ -33,7 +36,8 @@ template <class Interface, class Body> HRESULT image_method(IPixmat2** result, B
 }
 
 /// A method whose result is a number. A null result pointer is E_POINTER at once.
-template <class Interface, class T, class Body> HRESULT value_method(T* result, Body&& body) noexcept
+template <class Interface, class T, class Body>
+HRESULT value_method(T* result, Body&& body) noexcept
 {
     if (!result) return E_POINTER;
     return run_frame(Interface::iid, [&] {

@@ -32,15 +32,16 @@ HRESULT ReportCurrentException(const GUID& interface_id) noexcept
 {
     try {
         const HResultException failure = TranslateCurrentException();
-        leave_error(interface_id, {failure.source.c_str(), failure.description.c_str(), failure.helpFile.c_str(),
-                                   failure.helpContext});
+        leave_error(interface_id, {failure.source.c_str(), failure.description.c_str(),
+                                   failure.helpFile.c_str(), failure.helpContext});
         return failure.hresult;
     } catch (...) { // no memory left for the texts
         return E_OUTOFMEMORY;
     }
 }
 
-HRESULT ReportError(const GUID& class_id, const wchar_t* message, const GUID& interface_id, HRESULT code) noexcept
+HRESULT ReportError(const GUID& class_id, const wchar_t* message, const GUID& interface_id,
+                    HRESULT code) noexcept
 {
     try {
         const char* name = prog_id_of(class_id);

@@ -10,6 +10,7 @@ namespace Qor {
 HRESULT ReportCurrentException(const GUID& interface_id) noexcept;
 
 /// For faults that are found without an exception: leaves `message` with the class's name as source, gives `code`.
-HRESULT ReportError(const GUID& class_id, const wchar_t* message, const GUID& interface_id, HRESULT code) noexcept;
+HRESULT ReportError(const GUID& class_id, const wchar_t* message, const GUID& interface_id,
+                    HRESULT code) noexcept;
 
 } // namespace Qor

@@ -5,25 +5,28 @@
 #include "frame/errors.h"
 #include "zelt/interfaces/complex.h"
 #include "zelt/pixmat/layout.h"
-#include "zelt/pixmat/values.h"
+#include "zelt/values.h"
 
 namespace Qor::Luxar::Common {
 
-template <class T> HRESULT read_field(const T& field, T* value) noexcept
+template <class T>
+HRESULT read_field(const T& field, T* value) noexcept
 {
     if (!value) return E_POINTER;
     *value = field;
     return S_OK;
 }
 
-template <class T> HRESULT write_field(T& field, T value) noexcept
+template <class T>
+HRESULT write_field(T& field, T value) noexcept
 {
     field = value;
     return S_OK;
 }
 
 /// Two numbers with the properties X and Y.
-template <class Interface, class T> class pair_object : public automation<Interface> {
+template <class Interface, class T>
+class pair_object : public automation<Interface> {
 public:
     pair_object() noexcept = default;
     pair_object(T first, T second) noexcept : x(first), y(second) {}
@@ -37,11 +40,13 @@ public:
     T y{};
 };
 
-template <class Interface> using CCoordinateIntImpl = pair_object<Interface, LONG>;
+template <class Interface>
+using CCoordinateIntImpl = pair_object<Interface, LONG>;
 using CCoordinateFloat = pair_object<ICoordinateFloat, double>;
 using CFloatVector2D = pair_object<IFloatVector2D, double>;
 
-template <class Interface> class CRectangleIntImpl : public automation<Interface> {
+template <class Interface>
+class CRectangleIntImpl : public automation<Interface> {
 public:
     CRectangleIntImpl() noexcept = default;
     explicit CRectangleIntImpl(const rectangle& r) noexcept : value(r) {}
@@ -59,8 +64,9 @@ public:
 };
 
 /// The coclass Complex.
-class CoComplex : public dispatching<implements<ZELT::IComplex, error_support<ZELT::IComplex>, safe_for_scripts>,
-                                     ZELT::IComplex> {
+class CoComplex
+    : public dispatching<implements<ZELT::IComplex, error_support<ZELT::IComplex>, safe_for_scripts>,
+                         ZELT::IComplex> {
 public:
     HRESULT get_Real(double* value) noexcept override { return read_field(real, value); }
     HRESULT put_Real(double value) noexcept override { return write_field(real, value); }
@@ -71,28 +77,26 @@ public:
     double imaginary = 0;
 };
 
-// Value to object. A null out pointer is E_POINTER, no memory E_OUTOFMEMORY.
-HRESULT MakeCoordinateInt(LONG x, LONG y, ICoordinateInt** out) noexcept;
-HRESULT MakeCoordinateFloat(double x, double y, ICoordinateFloat** out) noexcept;
-HRESULT MakeRectangle(LONG left, LONG top, LONG right, LONG bottom, IRectangle** out) noexcept;
-
 // Object to value, read with gets in slot order. A null object is E_INVALIDARG.
 HRESULT ReadValue(ICoordinateInt* object, coordinate<int32_t>* value) noexcept;
 HRESULT ReadValue(ICoordinateFloat* object, coordinate<double>* value) noexcept;
 HRESULT ReadValue(IRectangle* object, rectangle* value) noexcept;
 
 /// An optional argument: null means absent.
-template <class Value> class optional_value {
+template <class Value>
+class optional_value {
 public:
     /// Throws HResultException for what the object answers.
-    template <class Interface> explicit optional_value(Interface* object) : present_(object != nullptr)
+    template <class Interface>
+    explicit optional_value(Interface* object) : present_(object != nullptr)
     {
         if (present_) CheckHResult(ReadValue(object, &value_));
     }
     optional_value() noexcept = default;
 
     /// For methods that answer codes: reads the object into `target`.
-    template <class Interface> static HRESULT read(Interface* object, optional_value* target) noexcept
+    template <class Interface>
+    static HRESULT read(Interface* object, optional_value* target) noexcept
     {
         target->present_ = object != nullptr;
         return object ? ReadValue(object, &target->value_) : S_OK;

@@ -23,7 +23,8 @@ void force_level(level l) noexcept;
 void use_best_level() noexcept;
 
 /// The member of a family's three tables that belongs to the level in use.
-template <class Table> const Table& at_level(const Table& v1, const Table& v3, const Table& v4) noexcept
+template <class Table>
+const Table& at_level(const Table& v1, const Table& v3, const Table& v4) noexcept
 {
     switch (current_level()) {
     case level::v4: return v4;

@@ -9,19 +9,23 @@ namespace {
 
 using namespace ZELT_LEVEL;
 
-template <size_t Bytes> struct element {
+template <size_t Bytes>
+struct element {
     uint8_t byte[Bytes];
 };
 
-template <class Element> void copy_elements(const memory_2d& target, const memory_2d& source)
+template <class Element>
+void copy_elements(const memory_2d& target, const memory_2d& source)
 {
-    with_rows<Element, Element>(target, source, [width = source.width, height = source.height](auto to, auto from) {
-        for (int32_t y = 0; y < height; ++y) {
-            const auto target_row = to[y];
-            const auto source_row = from[y];
-            for (int32_t x = 0; x < width; ++x) target_row[x] = static_cast<Element>(source_row[x]);
-        }
-    });
+    with_rows<Element, Element>(target, source,
+                                [width = source.width, height = source.height](auto to, auto from) {
+                                    for (int32_t y = 0; y < height; ++y) {
+                                        const auto target_row = to[y];
+                                        const auto source_row = from[y];
+                                        for (int32_t x = 0; x < width; ++x)
+                                            target_row[x] = static_cast<Element>(source_row[x]);
+                                    }
+                                });
 }
 
 void copy_rows(const memory_2d& target, const memory_2d& source, int64_t pixel_bytes)
@@ -67,7 +71,8 @@ void copy_pixels(const image_layout& target_layout, void* target, const image_la
     if (to.type != from.type)
         throw std::invalid_argument("target pixel_type and source pixel_type not identical");
     if (to.width != from.width) throw std::invalid_argument("target width and source width not identical");
-    if (to.height != from.height) throw std::invalid_argument("target height and source height not identical");
+    if (to.height != from.height)
+        throw std::invalid_argument("target height and source height not identical");
     const int64_t bytes = GetPixmatBits(to.type) / 8;
     if (to.x_stride == bytes && from.x_stride == bytes) return copy_rows(to, from, bytes);
     switch (bytes) {

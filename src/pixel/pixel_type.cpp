@@ -33,11 +33,24 @@ constexpr type_row rows[pixel_type_count] = {
 };
 
 constexpr const char* names[] = {
-    "Unsigned",      "Signed",         "Float",          "RGB",
-    "RGBA",          "BGR",            "Reserved3",      "Reserved4",
-    "Data",          "Reserved1",      "Complex_Float",  "Reserved2",
-    "Complex_Float_Half_Even", "BGRA", "Float_Vector2D", "Float_Vector3D",
-    "Float_Vector4D", "Complex_Float_Half_Odd",
+    "Unsigned",
+    "Signed",
+    "Float",
+    "RGB",
+    "RGBA",
+    "BGR",
+    "Reserved3",
+    "Reserved4",
+    "Data",
+    "Reserved1",
+    "Complex_Float",
+    "Reserved2",
+    "Complex_Float_Half_Even",
+    "BGRA",
+    "Float_Vector2D",
+    "Float_Vector3D",
+    "Float_Vector4D",
+    "Complex_Float_Half_Odd",
 };
 
 } // namespace

@@ -34,7 +34,8 @@ enum class pixel_type : int32_t {
 inline constexpr int pixel_type_count = 20;
 
 /// Storage of the pixels that are not plain numbers. Full and half-complex share one storage.
-template <class Part> struct complex_pixel {
+template <class Part>
+struct complex_pixel {
     Part real;
     Part imaginary;
 };
@@ -71,10 +72,7 @@ constexpr int32_t full_width(const image_layout& layout) noexcept
     return layout.width;
 }
 
-constexpr bool is_well_formed(const rectangle& r) noexcept
-{
-    return r.left <= r.right && r.top <= r.bottom;
-}
+constexpr bool is_well_formed(const rectangle& r) noexcept { return r.left <= r.right && r.top <= r.bottom; }
 
 constexpr bool fits(const rectangle& r, size s) noexcept
 {
@@ -82,14 +80,16 @@ constexpr bool fits(const rectangle& r, size s) noexcept
 }
 
 /// Names a storage type for a generic lambda: [&]<class T>(pixel<T>) { ... }.
-template <class T> struct pixel {
+template <class T>
+struct pixel {
     using type = T;
 };
 
 namespace detail {
 
 /// Calls the body for one of the eight real types and says whether the type was one.
-template <class Body> bool try_scalar(pixel_type type, Body&& body)
+template <class Body>
+bool try_scalar(pixel_type type, Body&& body)
 {
     switch (type) {
     case pixel_type::unsigned_8: body(pixel<uint8_t>{}); return true;
@@ -107,14 +107,16 @@ template <class Body> bool try_scalar(pixel_type type, Body&& body)
 } // namespace detail
 
 /// The standard set: every real type except the 64-bit integers. Any other type is a std::runtime_error.
-template <class Body> void switch_scalar(pixel_type type, Body&& body)
+template <class Body>
+void switch_scalar(pixel_type type, Body&& body)
 {
     if (!detail::try_scalar(type, body))
         throw std::runtime_error("SWITCH_PIXELENCODING: Format not supported");
 }
 
 /// The standard set and the 24-bit colours, which share one instantiation on colour_24.
-template <class Body> void switch_scalar_or_colour(pixel_type type, Body&& body)
+template <class Body>
+void switch_scalar_or_colour(pixel_type type, Body&& body)
 {
     if (type == pixel_type::rgb || type == pixel_type::bgr)
         body(pixel<colour_24>{});
@@ -123,7 +125,8 @@ template <class Body> void switch_scalar_or_colour(pixel_type type, Body&& body)
 }
 
 /// A family's own switch over the eight real types: std::invalid_argument with the family's text.
-template <class Body> void switch_scalar(pixel_type type, const char* unsupported, Body&& body)
+template <class Body>
+void switch_scalar(pixel_type type, const char* unsupported, Body&& body)
 {
     if (!detail::try_scalar(type, body)) throw std::invalid_argument(unsupported);
 }

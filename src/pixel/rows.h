@@ -8,7 +8,8 @@
 namespace Qor::Luxar::ZELT::ZELT_LEVEL {
 
 /// A pixel that may lie at any address.
-template <class T> struct pixel_reference {
+template <class T>
+struct pixel_reference {
     uint8_t* address;
 
     operator T() const
@@ -24,23 +25,29 @@ template <class T> struct pixel_reference {
     }
     pixel_reference(uint8_t* a) : address(a) {}
     pixel_reference(const pixel_reference&) = default;
-    const pixel_reference& operator=(const pixel_reference& other) const { return *this = static_cast<T>(other); }
+    const pixel_reference& operator=(const pixel_reference& other) const
+    {
+        return *this = static_cast<T>(other);
+    }
 };
 
-template <class T> struct contiguous_row {
+template <class T>
+struct contiguous_row {
     uint8_t* first;
 
     pixel_reference<T> operator[](int64_t x) const { return first + x * static_cast<int64_t>(sizeof(T)); }
 };
 
-template <class T> struct strided_row {
+template <class T>
+struct strided_row {
     uint8_t* first;
     int64_t stride;
 
     pixel_reference<T> operator[](int64_t x) const { return first + x * stride; }
 };
 
-template <class T> struct contiguous_rows {
+template <class T>
+struct contiguous_rows {
     using value_type = T;
     int32_t width, height;
     int64_t y_stride;
@@ -53,21 +60,24 @@ template <class T> struct contiguous_rows {
     contiguous_row<T> operator[](int64_t y) const { return {first + y * y_stride}; }
 };
 
-template <class T> struct strided_rows {
+template <class T>
+struct strided_rows {
     using value_type = T;
     int32_t width, height;
     int64_t x_stride, y_stride;
     uint8_t* first;
 
     explicit strided_rows(const memory_2d& m)
-        : width(m.width), height(m.height), x_stride(m.x_stride), y_stride(m.y_stride), first(m.data + m.offset)
+        : width(m.width), height(m.height), x_stride(m.x_stride), y_stride(m.y_stride),
+          first(m.data + m.offset)
     {
     }
     strided_row<T> operator[](int64_t y) const { return {first + y * y_stride, x_stride}; }
 };
 
 /// Calls the body with the rows of a view: with_rows<T>(view, [&](auto rows) { ... }).
-template <class T, class Body> decltype(auto) with_rows(const memory_2d& m, Body&& body)
+template <class T, class Body>
+decltype(auto) with_rows(const memory_2d& m, Body&& body)
 {
     if (m.x_stride == static_cast<int64_t>(sizeof(T))) return body(contiguous_rows<T>(m));
     return body(strided_rows<T>(m));

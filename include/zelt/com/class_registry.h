@@ -5,13 +5,15 @@
 
 namespace Qor {
 
-inline constexpr uint32_t CLSCTX_ALL = 23; ///< in-process, local and remote alike; every class here is in-process
+inline constexpr uint32_t CLSCTX_ALL =
+    23; ///< in-process, local and remote alike; every class here is in-process
 
 /// An instance of a class known to this process: REGDB_E_CLASSNOTREG for an unknown one.
 ZELT_API HRESULT CoCreateInstance(const GUID& class_id, IUnknown* outer, uint32_t context, const GUID& id,
                                   void** out) noexcept;
 /// The factory of a class, usually asked for IClassFactory.
-ZELT_API HRESULT CoGetClassObject(const GUID& class_id, uint32_t context, const GUID& id, void** out) noexcept;
+ZELT_API HRESULT CoGetClassObject(const GUID& class_id, uint32_t context, const GUID& id,
+                                  void** out) noexcept;
 /// "ZELT.Main2" or "ZELT.Main2.1" (case does not matter). CO_E_CLASSSTRING for an unknown name.
 ZELT_API HRESULT CLSIDFromProgID(const OLECHAR* name, GUID* class_id) noexcept;
 

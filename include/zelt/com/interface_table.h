@@ -28,7 +28,8 @@ struct argument_info {
     VARTYPE type;
     direction way;
     bool optional;
-    double default_number; ///< for an optional number; an optional object is null, an optional VARIANT missing
+    double
+        default_number; ///< for an optional number; an optional object is null, an optional VARIANT missing
     const GUID* interface_id;
     const enumeration_info* enumeration;
 };
@@ -65,6 +66,7 @@ struct ITypeInfo : IUnknown {
 };
 
 /// Specialised beside an enumeration that scripts see: `static constexpr enumeration_info info`.
-template <class E> struct enumeration_of;
+template <class E>
+struct enumeration_of;
 
 } // namespace Qor

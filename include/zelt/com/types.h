@@ -21,10 +21,7 @@ using LCID = uint32_t;
 inline constexpr VARIANT_BOOL VARIANT_TRUE = -1;
 inline constexpr VARIANT_BOOL VARIANT_FALSE = 0;
 
-constexpr HRESULT make_hresult(uint32_t code) noexcept
-{
-    return static_cast<HRESULT>(code);
-}
+constexpr HRESULT make_hresult(uint32_t code) noexcept { return static_cast<HRESULT>(code); }
 
 inline constexpr HRESULT S_OK = 0;
 inline constexpr HRESULT S_FALSE = 1;
@@ -32,7 +29,8 @@ inline constexpr HRESULT E_NOTIMPL = make_hresult(0x80004001);
 inline constexpr HRESULT E_NOINTERFACE = make_hresult(0x80004002);
 inline constexpr HRESULT E_POINTER = make_hresult(0x80004003);
 inline constexpr HRESULT E_FAIL = make_hresult(0x80004005);
-inline constexpr HRESULT E_SIZE_MISMATCH = make_hresult(0x8004000D); ///< a descriptor of another size than the input
+inline constexpr HRESULT E_SIZE_MISMATCH =
+    make_hresult(0x8004000D); ///< a descriptor of another size than the input
 inline constexpr HRESULT E_UNEXPECTED = make_hresult(0x8000FFFF);
 inline constexpr HRESULT E_ACCESSDENIED = make_hresult(0x80070005);
 inline constexpr HRESULT E_OUTOFMEMORY = make_hresult(0x8007000E);
@@ -52,14 +50,8 @@ inline constexpr HRESULT DISP_E_ARRAYISLOCKED = make_hresult(0x8002000D);
 inline constexpr HRESULT DISP_E_BADPARAMCOUNT = make_hresult(0x8002000E);
 inline constexpr HRESULT DISP_E_PARAMNOTOPTIONAL = make_hresult(0x8002000F);
 
-constexpr bool succeeded(HRESULT code) noexcept
-{
-    return code >= 0;
-}
-constexpr bool failed(HRESULT code) noexcept
-{
-    return code < 0;
-}
+constexpr bool succeeded(HRESULT code) noexcept { return code >= 0; }
+constexpr bool failed(HRESULT code) noexcept { return code < 0; }
 
 struct GUID {
     uint32_t data1;

@@ -25,7 +25,8 @@ protected:
 };
 
 /// Owns one reference. There is no other AddRef or Release in the library.
-template <class T> class com_ptr {
+template <class T>
+class com_ptr {
 public:
     com_ptr() noexcept = default;
     com_ptr(std::nullptr_t) noexcept {}
@@ -34,11 +35,8 @@ public:
     com_ptr(const com_ptr& other) noexcept : p_(other.p_) { add(); }
     com_ptr(com_ptr&& other) noexcept : p_(std::exchange(other.p_, nullptr)) {}
     template <class U>
-        requires std::is_convertible_v<U*, T*>
-    com_ptr(const com_ptr<U>& other) noexcept : p_(other.get())
-    {
-        add();
-    }
+        requires std::is_convertible_v<U*, T*> com_ptr(const com_ptr<U>& other)
+    noexcept : p_(other.get()) { add(); }
     ~com_ptr() { drop(); }
 
     com_ptr& operator=(com_ptr other) noexcept
@@ -79,7 +77,8 @@ public:
     friend bool operator==(const com_ptr& a, const com_ptr& b) noexcept { return a.p_ == b.p_; }
 
     /// Asks for another interface; null when the object does not have it.
-    template <class U> com_ptr<U> as() const noexcept
+    template <class U>
+    com_ptr<U> as() const noexcept
     {
         com_ptr<U> other;
         if (p_) p_->QueryInterface(U::iid, other.put_void());
@@ -100,7 +99,8 @@ private:
 };
 
 /// Asks a borrowed pointer for another interface; null in, null out.
-template <class U, class T> com_ptr<U> query(T* p) noexcept
+template <class U, class T>
+com_ptr<U> query(T* p) noexcept
 {
     com_ptr<U> other;
     if (p) p->QueryInterface(U::iid, other.put_void());

@@ -15,7 +15,8 @@ enum ZELT_Rounding : int32_t {
 
 } // namespace Qor::Luxar::ZELT
 
-template <> struct Qor::enumeration_of<Qor::Luxar::ZELT::ZELT_Rounding> {
+template <>
+struct Qor::enumeration_of<Qor::Luxar::ZELT::ZELT_Rounding> {
     static constexpr enumeration_value values[] = {
         {"ZELT_Rounding_Default", 0},
         {"ZELT_Rounding_Fastest", 1},

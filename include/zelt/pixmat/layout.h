@@ -59,7 +59,8 @@ struct rectangle {
     friend bool operator==(const rectangle&, const rectangle&) = default;
 };
 
-template <class T> struct coordinate {
+template <class T>
+struct coordinate {
     T x{};
     T y{};
 

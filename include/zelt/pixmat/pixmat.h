@@ -5,6 +5,7 @@
 // threads that write and read one image at the same time need an order of their own, as with any array.
 #pragma once
 
+#include "zelt/com/interface_table.h"
 #include "zelt/com/variant.h"
 #include "zelt/pixmat/layout.h"
 #include "zelt/pixmat/values.h"
@@ -160,8 +161,9 @@ struct IPixmatFactory : IDispatch {
     static constexpr const char* interface_name = "IPixmatFactory";
     using base = IDispatch;
 
-    /// A zero-filled image. Any encoding is accepted. E_INVALIDARG for a null descriptor, negative sizes, bits below
-    /// 1 or a layout whose pixels leave 64-bit addresses; E_OUTOFMEMORY when it cannot be had.
+    /// A zero-filled image. Any encoding is accepted, and sizes of 0. E_INVALIDARG for a null descriptor, another
+    /// mode, negative sizes or bits below 1; E_OUTOFMEMORY when the memory cannot be had, and for packed rows of
+    /// more than 2^31 - 1 bytes. In mode 1 overlapping pixels (strides of 0) are the caller's wish.
     virtual HRESULT Create(IPixmatDescriptor* descriptor, PixmatCreateMode mode, IPixmat2** out) noexcept = 0;
 };
 
@@ -175,3 +177,49 @@ ZELT_API HRESULT WrapPixmat(const image_layout& layout, void* data, bool read_on
                             void* context, IPixmat2** out) noexcept;
 
 } // namespace Qor::Luxar
+
+namespace Qor {
+
+template <>
+struct enumeration_of<Luxar::PixmatEncoding> {
+    static constexpr enumeration_value values[] = {
+        {"PixmatEncoding_Unsigned", Luxar::PixmatEncoding_Unsigned},
+        {"PixmatEncoding_Signed", Luxar::PixmatEncoding_Signed},
+        {"PixmatEncoding_Float", Luxar::PixmatEncoding_Float},
+        {"PixmatEncoding_RGB", Luxar::PixmatEncoding_RGB},
+        {"PixmatEncoding_RGBA", Luxar::PixmatEncoding_RGBA},
+        {"PixmatEncoding_BGR", Luxar::PixmatEncoding_BGR},
+        {"PixmatEncoding_Reserved3", Luxar::PixmatEncoding_Reserved3},
+        {"PixmatEncoding_Reserved4", Luxar::PixmatEncoding_Reserved4},
+        {"PixmatEncoding_Data", Luxar::PixmatEncoding_Data},
+        {"PixmatEncoding_Reserved1", Luxar::PixmatEncoding_Reserved1},
+        {"PixmatEncoding_Complex_Float", Luxar::PixmatEncoding_Complex_Float},
+        {"PixmatEncoding_Reserved2", Luxar::PixmatEncoding_Reserved2},
+        {"PixmatEncoding_Complex_Float_Half_Even", Luxar::PixmatEncoding_Complex_Float_Half_Even},
+        {"PixmatEncoding_BGRA", Luxar::PixmatEncoding_BGRA},
+        {"PixmatEncoding_Float_Vector2D", Luxar::PixmatEncoding_Float_Vector2D},
+        {"PixmatEncoding_Float_Vector3D", Luxar::PixmatEncoding_Float_Vector3D},
+        {"PixmatEncoding_Float_Vector4D", Luxar::PixmatEncoding_Float_Vector4D},
+        {"PixmatEncoding_Complex_Float_Half_Odd", Luxar::PixmatEncoding_Complex_Float_Half_Odd},
+    };
+    static constexpr enumeration_info info{"PixmatEncoding", values};
+};
+
+template <>
+struct enumeration_of<Luxar::PixmatEventMode> {
+    static constexpr enumeration_value values[] = {
+        {"PixmatEventMode_AfterCommit", Luxar::PixmatEventMode_AfterCommit},
+    };
+    static constexpr enumeration_info info{"PixmatEventMode", values};
+};
+
+template <>
+struct enumeration_of<Luxar::PixmatCreateMode> {
+    static constexpr enumeration_value values[] = {
+        {"PixmatCreateMode_Layout", Luxar::PixmatCreateMode_Layout},
+        {"PixmatCreateMode_Packed", Luxar::PixmatCreateMode_Packed},
+    };
+    static constexpr enumeration_info info{"PixmatCreateMode", values};
+};
+
+} // namespace Qor
