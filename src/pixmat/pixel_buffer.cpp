@@ -1,0 +1,32 @@
+#include "pixmat/pixel_buffer.h"
+
+#include <cstring>
+#include <new>
+
+namespace Qor::Luxar {
+
+pixel_buffer pixel_buffer::allocate(size_t bytes, fill content) noexcept
+{
+    pixel_buffer buffer;
+    if (bytes > PTRDIFF_MAX) return buffer;
+    if (bytes >= mapped_from) {
+        const mapped_block block = take_block(bytes);
+        buffer.base_ = block.base;
+        buffer.mapped_bytes_ = block.bytes;
+        if (block.recycled && content == zeroed) std::memset(block.base, 0, bytes);
+        return buffer;
+    }
+    buffer.base_ = static_cast<uint8_t*>(::operator new (bytes, std::align_val_t{alignment}, std::nothrow));
+    if (buffer.base_ && content == zeroed) std::memset(buffer.base_, 0, bytes);
+    return buffer;
+}
+
+pixel_buffer::~pixel_buffer()
+{
+    if (mapped_bytes_ > 0)
+        give_block(base_, mapped_bytes_);
+    else
+        ::operator delete (base_, std::align_val_t{alignment});
+}
+
+} // namespace Qor::Luxar
