@@ -21,9 +21,13 @@ foreach(library ${object_libraries})
     list(APPEND objects $<TARGET_OBJECTS:${library}>)
 endforeach()
 
-add_library(zelt_internal STATIC ${objects})
-target_include_directories(zelt_internal PUBLIC ${PROJECT_SOURCE_DIR}/include ${PROJECT_SOURCE_DIR}/src)
-target_link_libraries(zelt_internal PUBLIC ${system_libraries} Threads::Threads ${CMAKE_DL_LIBS})
+# Linked whole: creatable classes enter themselves in the class registry when their object is loaded, and nothing
+# else refers to those objects.
+add_library(zelt_internal_archive STATIC ${objects})
+add_library(zelt_internal INTERFACE)
+target_include_directories(zelt_internal INTERFACE ${PROJECT_SOURCE_DIR}/include ${PROJECT_SOURCE_DIR}/src)
+target_link_libraries(zelt_internal INTERFACE
+    "$<LINK_LIBRARY:WHOLE_ARCHIVE,zelt_internal_archive>" ${system_libraries} Threads::Threads ${CMAKE_DL_LIBS})
 
 if(NOT ZELT_FUZZ)
     add_library(zelt SHARED ${objects})

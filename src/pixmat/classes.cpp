@@ -22,7 +22,9 @@ constexpr class_entry descriptor{CLSID_PixmatDescriptor, "ZELT.PixmatDescriptor.
 constexpr class_entry factory{CLSID_PixmatFactory, "ZELT.PixmatFactory.1", "ZELT.PixmatFactory",
                               "makes images", &create<CPixmatFactory>};
 
-class_registration registrations[] = {class_registration(descriptor), class_registration(factory)};
-
 } // namespace
+
+// Not in the unnamed namespace: programs that link the archive ask for this name, or nothing would pull it in.
+extern class_registration pixmat_classes[2];
+class_registration pixmat_classes[2] = {class_registration(descriptor), class_registration(factory)};
 } // namespace Qor::Luxar
