@@ -8,9 +8,23 @@
 namespace Qor {
 namespace {
 
-HResultException with_text(HRESULT code, const std::exception& e) { return {code, e.what()}; }
+/// When memory is out, the code is more important than its text.
+template <class Make>
+HResultException at_least_the_code(HRESULT code, Make&& make_all)
+{
+    try {
+        return make_all();
+    } catch (const std::bad_alloc&) {
+        return HResultException(code);
+    }
+}
 
-HResultException from_error_object(const com_error& e)
+HResultException with_text(HRESULT code, const std::exception& e)
+{
+    return at_least_the_code(code, [&] { return HResultException(code, e.what()); });
+}
+
+HResultException read_error_object(const com_error& e)
 {
     HResultException failure(e.code());
     IErrorInfo* info = e.info();
@@ -22,6 +36,11 @@ HResultException from_error_object(const com_error& e)
     uint32_t context = 0;
     if (succeeded(info->GetHelpContext(&context))) failure.helpContext = context;
     return failure;
+}
+
+HResultException from_error_object(const com_error& e)
+{
+    return at_least_the_code(e.code(), [&] { return read_error_object(e); });
 }
 
 HRESULT of_system(int32_t code)
