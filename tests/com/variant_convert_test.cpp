@@ -220,7 +220,7 @@ TEST(VariantChangeType, ReadsWholeStringsOnly)
         {L"18446744073709551616", VT_R8, S_OK, 18446744073709551616.0L},
         {many_zeros + L"7", VT_I4, S_OK, 7},
         {L"0." + many_zeros + L"1e5001", VT_R8, S_OK, 1},
-        {L"16777217.0000001", VT_R4, S_OK, 16777218}, // a double in between would tie to 16777216
+        {L"16777217.000000001", VT_R4, S_OK, 16777218}, // a double in between would tie to 16777216
         {L"1e400", VT_R8, DISP_E_OVERFLOW, 0},
         {L"1e39", VT_R4, DISP_E_OVERFLOW, 0},
         {L"1e-400", VT_R8, S_OK, 0},
