@@ -2,7 +2,7 @@
 
 # Building, running and testing.
 build_packages="build-essential g++ cmake ninja-build ccache pkg-config git
-libopencv-core-dev libopencv-imgproc-dev libopencv-imgcodecs-dev libcfitsio-dev libcli11-dev
+libopencv-core-dev libopencv-imgproc-dev libopencv-imgcodecs-dev libcfitsio-dev libcli11-dev libsleef-dev
 libgtest-dev libbenchmark-dev
 python3 python3-numpy python3-skimage python3-pytest"
 

@@ -1,4 +1,5 @@
 // The classes of the image component, for creation by identifier or name.
+#include "pixmat/converter.h"
 #include "pixmat/descriptor.h"
 #include "pixmat/factory.h"
 #include "zelt/com/class_registry.h"
@@ -22,9 +23,11 @@ constexpr class_entry descriptor{CLSID_PixmatDescriptor, "ZELT.PixmatDescriptor.
 constexpr class_entry factory{CLSID_PixmatFactory, "ZELT.PixmatFactory.1", "ZELT.PixmatFactory",
                               "makes images", &create<CPixmatFactory>};
 
-} // namespace
+constexpr class_entry converter{CLSID_PixmatConverter, "ZELT.PixmatConverter.1", "ZELT.PixmatConverter",
+                                "copies and converts pixels", &create<CPixmatConverter>};
 
-// Not in the unnamed namespace: programs that link the archive ask for this name, or nothing would pull it in.
-extern class_registration pixmat_classes[2];
-class_registration pixmat_classes[2] = {class_registration(descriptor), class_registration(factory)};
+class_registration registrations[] = {class_registration(descriptor), class_registration(factory),
+                                      class_registration(converter)};
+
+} // namespace
 } // namespace Qor::Luxar

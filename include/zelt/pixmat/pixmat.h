@@ -103,13 +103,21 @@ struct IPixmatTransfer : IUnknown {
     static constexpr const char* interface_name = "IPixmatTransfer";
     using base = IUnknown;
 
-    /// Null pointers are E_POINTER; layouts of different width or height, or a pair without mapping, E_NOTIMPL or
-    /// E_INVALIDARG before anything is written. The last two are 0.
+    /// Null pointers are E_POINTER; layouts of different width or height and a rectangle or point E_INVALIDARG; a
+    /// pair without mapping E_NOTIMPL: nothing is written then. Without table and levels the pixels are recoded as by
+    /// ConvertRecode. The last two are 0.
     virtual HRESULT Run(const void* source, void* target, const rectangle* source_area,
                         const coordinate<int32_t>* target_point) noexcept = 0;
     /// `count` colour numbers (see ILookupTable) over the value range low..high: the entry of a value v is
-    /// floor((v - low) / (high - low) * count), limited to the table. Targets must be colour.
+    /// floor((v - low) / (high - low) * count), limited to the table (NaN: the first). The value of a colour is its
+    /// luminance; complex sources and targets without colour are E_NOTIMPL in Run. Alpha is 255. A table goes before
+    /// levels. E_POINTER for null entries, E_INVALIDARG for a count below 1.
     virtual HRESULT SetLookupTable(const uint32_t* entries, LONG count, double low, double high) noexcept = 0;
+    /// Levels act on the nominal range of the source mapped to [0, 1] (floats: the value itself) and end on that of
+    /// the target: u = (v - 0.5) * contrast + 0.5 + brightness, limited to [0, 1]; u to the power of 1 / gamma; then
+    /// 0.5 (2u)^sigma below one half and 1 - 0.5 (2 (1 - u))^sigma above; rounded, float targets not. Colour to colour
+    /// acts on each channel and keeps alpha. Defaults (1, 0, 1, 1) leave pixels of the same range as they are. Values
+    /// that are not finite, gamma and sigma of 0 and below are E_INVALIDARG; complex pixels E_NOTIMPL in Run.
     virtual HRESULT SetContrast(double value) noexcept = 0;
     virtual HRESULT SetBrightness(double value) noexcept = 0;
     virtual HRESULT SetGamma(double value) noexcept = 0;
@@ -118,7 +126,9 @@ struct IPixmatTransfer : IUnknown {
 
 /// Element-wise copy and conversion between two layouts. A new object for each use; it has no state.
 /// Both conversions take any strides; a rectangle that leaves the source or lands outside the destination is
-/// E_INVALIDARG before anything is written; a region of non-positive width or height is an empty success.
+/// E_INVALIDARG before anything is written; a region of non-positive width or height is an empty success. Null data
+/// is E_POINTER unless the region is empty. Source and target may be the same pixels; what else overlaps gives no
+/// defined values.
 struct IPixmatConverter : IUnknown {
     static constexpr GUID iid = guid("5a1e0000-0207-4000-8000-00000000c0de");
     static constexpr const char* interface_name = "IPixmatConverter";
@@ -140,8 +150,9 @@ struct IPixmatConverter : IUnknown {
                                 IPixmatTransfer** out) noexcept = 0;
     /// Reserved: E_NOTIMPL.
     virtual HRESULT Reserved2() noexcept = 0;
-    /// The plain numeric conversion: truncation toward zero, low bits kept (through a 64-bit integer; NaN and
-    /// values beyond 64 bits give 0), nothing limited. Colour casts to the same layout only.
+    /// The plain numeric conversion: truncation toward zero, low bits kept (through a 64-bit integer; NaN and what
+    /// neither a signed nor an unsigned one holds give 0), nothing limited. Complex as in ConvertRecode. Colour casts
+    /// to the same layout only; anything else is E_NOTIMPL.
     virtual HRESULT ConvertCast(const image_layout& source_layout, const void* source,
                                 const image_layout& target_layout, void* target, const rectangle* source_area,
                                 const coordinate<int32_t>* target_point) noexcept = 0;
