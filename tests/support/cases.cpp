@@ -28,13 +28,8 @@ const char* name(level l) noexcept { return l == level::v4 ? "v4" : l == level::
 std::string name(size s) { return std::to_string(s.width) + " x " + std::to_string(s.height); }
 
 pixel_memory::pixel_memory(size s, memory_layout l, int64_t pixel_bytes)
-    : offset(0),
-      x_stride(pixel_bytes),
-      y_stride(s.width * pixel_bytes),
-      size_(s),
-      pixel_bytes_(pixel_bytes),
-      first_(64),
-      end_(64)
+    : offset(0), x_stride(pixel_bytes), y_stride(s.width * pixel_bytes), size_(s), pixel_bytes_(pixel_bytes),
+      first_(64), end_(64)
 {
     const int64_t right = std::max(s.width - 1, 0);
     const int64_t bottom = std::max(s.height - 1, 0);
@@ -71,13 +66,8 @@ pixel_memory::pixel_memory(size s, memory_layout l, int64_t pixel_bytes)
 }
 
 pixel_memory::pixel_memory(const pixel_memory& other)
-    : offset(other.offset),
-      x_stride(other.x_stride),
-      y_stride(other.y_stride),
-      size_(other.size_),
-      pixel_bytes_(other.pixel_bytes_),
-      first_(other.first_),
-      end_(other.end_)
+    : offset(other.offset), x_stride(other.x_stride), y_stride(other.y_stride), size_(other.size_),
+      pixel_bytes_(other.pixel_bytes_), first_(other.first_), end_(other.end_)
 {
     other.guard(false);
     lines_ = other.lines_;
