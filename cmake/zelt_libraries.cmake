@@ -32,7 +32,7 @@ target_link_libraries(zelt_internal INTERFACE
 if(NOT ZELT_FUZZ)
     add_library(zelt SHARED ${objects})
     add_library(zelt::zelt ALIAS zelt)
-    set_target_properties(zelt PROPERTIES VERSION ${PROJECT_VERSION} SOVERSION ${PROJECT_VERSION_MAJOR})
+    set_target_properties(zelt PROPERTIES VERSION ${PROJECT_VERSION} SOVERSION ${PROJECT_VERSION_MAJOR} INSTALL_RPATH "")
     target_compile_features(zelt INTERFACE cxx_std_20)
     target_include_directories(zelt INTERFACE
         $<BUILD_INTERFACE:${PROJECT_SOURCE_DIR}/include> $<INSTALL_INTERFACE:${CMAKE_INSTALL_INCLUDEDIR}>)
