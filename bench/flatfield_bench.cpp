@@ -1,6 +1,6 @@
-// Flat-field correction of camera frames: 16-bit source and dark reference, fixed-point or float gain, 16-bit result.
-// The peers are OpenCV's passes with the same arithmetic; they differ from it only where a product lies between two
-// whole numbers. Frames are at most 65535 apart, so that saturation plays no part.
+// Flat-field correction of camera frames: 16-bit source and dark reference, fixed-point or float gain, 16-bit
+// result. The peers are OpenCV's passes with the same arithmetic; they differ from it only where a product
+// lies between two whole numbers. Frames are at most 65535 apart, so that saturation plays no part.
 #include "support/bench.h"
 
 #include "flatfield/kernels/flatten.h"

@@ -70,15 +70,3 @@ const interface_info& table_of<IStatistics>() noexcept
 }
 } // namespace Qor
 #endif
-#if !__has_include("flatfield/flatfield.h")
-namespace Qor {
-namespace {
-constexpr std::tuple<> no_rows2;
-}
-template <>
-const interface_info& table_of<IFlatFielding>() noexcept
-{
-    return interface_table<IFlatFielding, no_rows2>::info("");
-}
-} // namespace Qor
-#endif

@@ -5,10 +5,7 @@
 #include "conversions/complex.h"
 #include "conversions/conversions.h"
 #include "filters/filters.h"
-#if __has_include("flatfield/flatfield.h") // TEMPORARY
 #include "flatfield/flatfield.h"
-#define HAVE_flatfield 1
-#endif
 #include "fourier/fourier.h"
 #include "frame/operation.h"
 #include "geometry/geometry.h"
@@ -27,9 +24,6 @@ namespace Qor::Luxar::ZELT {
 
 #ifndef HAVE_statistics
 class CStatistics : public automation<IStatistics> {};
-#endif
-#ifndef HAVE_flatfield
-class CFlatFielding : public automation<IFlatFielding> {};
 #endif
 /// What all roots do: keep the rounding mode, make facets at first use and keep them.
 template <class Base, class Root, const GUID& ClassId>

@@ -57,8 +57,8 @@ T merged_gain(int64_t l, int64_t h, int64_t d, G g, int64_t t, double k, int32_t
     }
 }
 
-/// Operands at every size, layout and level; levels of saturation that occur. The images of the test support begin at
-/// an offset, which keeps the eight lanes out of it.
+/// Operands at every size, layout and level; levels of saturation that occur. The images of the test support
+/// begin at an offset, which keeps the eight lanes out of it.
 template <class T, class S, class D, class G, class Merge, class Expected>
 void sweep(Merge merge, Expected expected)
 {

@@ -112,7 +112,8 @@ T fixed_gain(T p, double norm, int32_t scale)
 
 constexpr double norms[] = {-1.0, 0.0, 100.0, 1e9, 0.25, NAN, HUGE_VAL, -HUGE_VAL};
 
-/// A gain reference of type T of sources of type S, over every size and layout; a mean where the norm asks for one.
+/// A gain reference of type T of sources of type S, over every size and layout; a mean where the norm asks
+/// for one.
 template <class T, class S, class Expected>
 void sweep_gain(Expected expected)
 {

@@ -5,17 +5,7 @@
 #include "zelt/interfaces/complex.h"
 #include "zelt/interfaces/conversions.h"
 #include "zelt/interfaces/filters.h"
-#if __has_include("zelt/interfaces/flatfield.h") // TEMPORARY
 #include "zelt/interfaces/flatfield.h"
-#else
-namespace Qor::Luxar::ZELT {
-struct IFlatFielding : IDispatch {
-    static constexpr GUID iid = guid("5a1e0000-0320-4000-8000-00000000c0de");
-    static constexpr const char* interface_name = "IFlatFielding";
-    using base = IDispatch;
-};
-} // namespace Qor::Luxar::ZELT
-#endif
 #include "zelt/interfaces/fourier.h"
 #include "zelt/interfaces/geometry.h"
 #include "zelt/interfaces/morphology.h"

@@ -55,8 +55,9 @@ constexpr number number_of(const image_layout& l)
     }
 }
 
-/// True when a value of so many bytes can be read or written at each pixel without touching what lies behind the
-/// last one. It fails for packed pixels of 17 to 24 bits, for instance, whose storage counts as four bytes.
+/// True when a value of so many bytes can be read or written at each pixel without touching what lies behind
+/// the last one. It fails for packed pixels of 17 to 24 bits, for instance, whose storage counts as four
+/// bytes.
 constexpr bool holds(const image_layout& l, int64_t bytes)
 {
     const int64_t distance = l.x_stride < 0 ? -int64_t{l.x_stride} : l.x_stride;

@@ -1,5 +1,5 @@
-// One camera row: the dark reference subtracted, the gain multiplied in. Differences of integers live in 32 bits
-// and wrap; every product of integers is formed unsigned, so that nothing here is undefined.
+// One camera row: the dark reference subtracted, the gain multiplied in. Differences of integers live in 32
+// bits and wrap; every product of integers is formed unsigned, so that nothing here is undefined.
 #pragma once
 
 #include "flatfield/kernels/each_pixel.inl"
@@ -100,8 +100,8 @@ struct multiply_float {
 // Differences are above -65536 and below 98304, and 98304 times 2^14 is below 2^31.
 inline constexpr float small_gain = 16384.0f;
 
-/// The same result for gains below small_gain in size, and not negative where T is unsigned and narrow: everything
-/// fits 32 bits, and the loop is vectorised.
+/// The same result for gains below small_gain in size, and not negative where T is unsigned and narrow:
+/// everything fits 32 bits, and the loop is vectorised.
 template <class T, class S, class D>
 struct multiply_small_float {
     T operator()(S s, D d, float g) const
@@ -117,8 +117,8 @@ struct multiply_small_float {
 template <class T, class Row>
 bool all_small(int64_t begin, int64_t end, Row gain)
 {
-    // The bits of positive floats are ordered like their values. A difference is negative above the limit, NaN too,
-    // and the bits themselves are for negative floats.
+    // The bits of positive floats are ordered like their values. A difference is negative above the limit,
+    // NaN too, and the bits themselves are for negative floats.
     constexpr bool positive_only = T(-1) > T(0);
     constexpr uint32_t limit = __builtin_bit_cast(uint32_t, small_gain) - 1;
     uint32_t signs = 0;

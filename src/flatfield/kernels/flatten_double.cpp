@@ -43,8 +43,9 @@ row_function choose(const merge_table& table, const exposures& e)
 
 bool is_aligned(const image& i) { return reinterpret_cast<uintptr_t>(i.data) % 16 == 0; }
 
-/// The conditions under which eight pixels at a time are computed in sixteen-bit lanes. The results differ from the
-/// general ones in rounding and overflow, so these conditions are part of the operation, on every processor.
+/// The conditions under which eight pixels at a time are computed in sixteen-bit lanes. The results differ
+/// from the general ones in rounding and overflow, so these conditions are part of the operation, on every
+/// processor.
 bool in_lanes(const exposures& e, int32_t scale_factor)
 {
     if (e.short_exposure.absent() || e.dark.absent() || e.gain.absent()) return false;

@@ -18,8 +18,9 @@ struct merge_layouts {
 /// Throws std::invalid_argument with the texts of IFlatFielding::FlattenDouble, in their order.
 void check_merge(const merge_layouts& layouts);
 
-/// What check_merge has accepted; the short exposure, the dark reference and the gain may be absent. ratio: of the
-/// exposure times. Rows in parallel on the pool; null means the calling thread. Fails before anything is written.
+/// What check_merge has accepted; the short exposure, the dark reference and the gain may be absent. ratio:
+/// of the exposure times. Rows in parallel on the pool; null means the calling thread. Fails before anything
+/// is written.
 outcome flatten_double(const image& dst, const image& long_exposure, const image& short_exposure,
                        double ratio, const image& dark, const image& gain, int32_t scale_factor,
                        Thread::ThreadPool* pool);

@@ -1,5 +1,5 @@
-// One row of two exposures merged. L is the long exposure's pixel, H the short one's; which of them a pixel takes,
-// and which is scaled, differs between the rules with and without a gain. That is deliberate.
+// One row of two exposures merged. L is the long exposure's pixel, H the short one's; which of them a pixel
+// takes, and which is scaled, differs between the rules with and without a gain. That is deliberate.
 #pragma once
 
 #include "flatfield/kernels/flatten.inl"

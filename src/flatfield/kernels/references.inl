@@ -25,7 +25,8 @@ double sum_pixels(Src src)
     return static_cast<double>(sum);
 }
 
-/// A pixel that saw no signal gets the highest gain, 50. The order of the comparisons lets a NaN of the norm through.
+/// A pixel that saw no signal gets the highest gain, 50. The order of the comparisons lets a NaN of the norm
+/// through.
 template <class T, class Dst, class Src>
 void real_gain(Dst dst, Src src, double norm)
 {
