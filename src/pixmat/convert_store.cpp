@@ -28,13 +28,14 @@ struct limits {
     W limit(W v) const noexcept { return v < low ? low : v > high ? high : v; }
 };
 
-/// Rounds half away from zero. The value lies within the integer type; the remainder is exact.
+/// Rounds half away from zero. The value lies within the integer type; the remainder is exact, and twice the
+/// remainder, truncated, is what the rounding adds.
 template <class Integer, class Real>
 Integer rounded(Real v) noexcept
 {
     const auto whole = static_cast<Integer>(v);
     const Real rest = v - static_cast<Real>(whole);
-    return static_cast<Integer>(whole + (rest >= Real{0.5}) - (rest <= Real{-0.5}));
+    return static_cast<Integer>(whole + static_cast<Integer>(rest + rest));
 }
 
 /// A value for an integer pixel T, which the limits describe.
@@ -137,7 +138,8 @@ void store_colours(const void* __restrict values, int count, uint8_t* __restrict
 }
 
 template <class From, class To>
-void row_to_float(const uint8_t* from, uint8_t* to, int64_t count, const nominal_range&) noexcept
+void row_to_float(const uint8_t* __restrict from, uint8_t* __restrict to, int64_t count,
+                  const nominal_range&) noexcept
 {
     for (int64_t i = 0; i < count; ++i)
         write(to + i * static_cast<int64_t>(sizeof(To)),
@@ -145,7 +147,8 @@ void row_to_float(const uint8_t* from, uint8_t* to, int64_t count, const nominal
 }
 
 template <class From, class To>
-void row_to_integer(const uint8_t* from, uint8_t* to, int64_t count, const nominal_range& range) noexcept
+void row_to_integer(const uint8_t* __restrict from, uint8_t* __restrict to, int64_t count,
+                    const nominal_range& range) noexcept
 {
     static_assert(sizeof(To) <= 2); // the limits are exact in any float
     const limits<From> l(range);

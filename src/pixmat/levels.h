@@ -11,8 +11,9 @@ struct levels {
     double gamma = 1.0;
     double sigma = 1.0;
 
-    /// A level and the result are on [0, 1]; NaN stays NaN. The same bits on every processor.
-    double apply(double level) const noexcept;
+    /// Turns up to block_size levels on [0, 1] into others, in place; NaN stays NaN. The same bits on every
+    /// processor.
+    void apply(double* values, int count) const noexcept;
 
     friend bool operator==(const levels&, const levels&) = default;
 };

@@ -6,13 +6,15 @@
 
 #include <array>
 #include <cmath>
+#include <numeric>
 
 namespace Qor::Luxar {
 namespace {
 
 using namespace Convert;
 
-/// f(value) for pixels of a small type is tabulated when that is less work than asking for each pixel.
+/// f(values, count, results) for the pixels of an image, a block at a time. For a small pixel type all its values are
+/// tabulated when that is less work than asking for each pixel.
 template <class T, class F>
 class tabulated {
 public:
@@ -38,7 +40,7 @@ public:
         }
         double reals[block_size];
         to_real(kind, values, count, reals);
-        for (int i = 0; i < count; ++i) out[i] = function_(reals[i]);
+        function_(reals, count, out);
     }
 
 private:
@@ -46,8 +48,12 @@ private:
     {
         if (int64_t{from.width} * from.height <= entries) return;
         low_ = low;
-        table_.reserve(static_cast<size_t>(entries));
-        for (int32_t i = 0; i < entries; ++i) table_.push_back(function_(static_cast<double>(low + i)));
+        table_.resize(static_cast<size_t>(entries));
+        double values[block_size];
+        for (int32_t first = 0; first < entries; first += block_size) {
+            for (int i = 0; i < block_size; ++i) values[i] = low + first + i;
+            function_(values, block_size, table_.data() + first);
+        }
     }
 
     F function_;
@@ -104,10 +110,14 @@ HRESULT CPixmatTransfer::look_up(const memory_2d& from, const memory_2d& to) con
     const loader value = load_value(from.type);
     if (!is_colour(to.type) || !value.load || is_full_complex(from.type)) return E_NOTIMPL;
     const auto count = static_cast<double>(table_.size());
-    const auto colour_of = tabulate<colour_32>(from, [this, count](double v) {
-        const double index = std::floor((v - low_) / (high_ - low_) * count);
-        if (!(index > 0.0)) return table_.front(); // NaN, too
-        return index < count ? table_[static_cast<size_t>(index)] : table_.back();
+    const auto colour_of = tabulate<colour_32>(from, [this, count](const double* v, int n, colour_32* out) {
+        for (int i = 0; i < n; ++i) {
+            const double index = std::floor((v[i] - low_) / (high_ - low_) * count);
+            if (!(index > 0.0)) // NaN, too
+                out[i] = table_.front();
+            else
+                out[i] = index < count ? table_[static_cast<size_t>(index)] : table_.back();
+        }
     });
     const store_pixels store = store_colour(to.type);
     block values;
@@ -126,14 +136,19 @@ HRESULT CPixmatTransfer::level(const memory_2d& from, const memory_2d& to) const
     if (!number_or_colour(from.type) || !number_or_colour(to.type)) return E_NOTIMPL;
     const auto from_scale = level_scale::of(from.type, source_layout_.bits);
     const auto to_scale = level_scale::of(to.type, target_layout_.bits);
-    const auto new_value = [this, from_scale, to_scale](double v) {
-        return to_scale.value(levels_.apply(from_scale.level(v)));
+    const auto new_values = [this, from_scale, to_scale](const double* v, int n, double* out) {
+        for (int i = 0; i < n; ++i) out[i] = from_scale.level(v[i]);
+        levels_.apply(out, n);
+        for (int i = 0; i < n; ++i) out[i] = to_scale.value(out[i]);
     };
     block values;
     if (is_colour(from.type) && is_colour(to.type)) {
+        static_assert(block_size == 256);
+        double results[256];
         std::array<uint8_t, 256> channel;
-        for (size_t i = 0; i < channel.size(); ++i)
-            channel[i] = static_cast<uint8_t>(new_value(static_cast<double>(i)) + 0.5);
+        std::iota(results, results + 256, 0.0);
+        new_values(results, 256, results);
+        for (size_t i = 0; i < 256; ++i) channel[i] = static_cast<uint8_t>(results[i] + 0.5);
         const load_pixels load = load_colour(from.type).load;
         const store_pixels store = store_colour(to.type);
         for_each_block(from, to, [&](const uint8_t* source, uint8_t* target, int n) {
@@ -147,7 +162,7 @@ HRESULT CPixmatTransfer::level(const memory_2d& from, const memory_2d& to) const
     const loader value = load_value(from.type);
     const store_pixels store = store_value(to.type, working::real);
     const nominal_range range = is_number(to.type) ? range_of(to.type, target_layout_.bits) : nominal_range{};
-    const auto levelled = tabulate<double>(from, new_value);
+    const auto levelled = tabulate<double>(from, new_values);
     double results[block_size];
     for_each_block(from, to, [&](const uint8_t* source, uint8_t* target, int n) {
         value.load(source, from.x_stride, n, values.bytes);

@@ -121,6 +121,24 @@ TEST(Levels, ScaleBetweenRangesAndActOnChannels)
     EXPECT_EQ(bgr[0], 0);
 }
 
+TEST(Levels, GiveTheSameBitsAloneAndInARow)
+{
+    std::vector<float> pixels(301);
+    std::vector<double> row(301);
+    for (size_t i = 0; i < pixels.size(); ++i) pixels[i] = static_cast<float>(i) / 300;
+    const auto run = [](const float* from, double* to, size_t count) {
+        const auto t = transfer_between(row_of(count, 32, real), row_of(count, 64, real));
+        set(t.get(), {1.1, 0.01, 2.2, 1.3});
+        ASSERT_EQ(t->Run(from, to, nullptr, nullptr), S_OK);
+    };
+    run(pixels.data(), row.data(), row.size());
+    for (size_t i = 0; i < pixels.size(); ++i) {
+        double alone = -1;
+        run(&pixels[i], &alone, 1);
+        EXPECT_EQ(alone, row[i]) << i;
+    }
+}
+
 TEST(Levels, RefuseValuesWithoutMeaning)
 {
     const auto t = transfer_between(row_of(1, 8, grey), row_of(1, 8, grey));

@@ -127,8 +127,8 @@ struct IPixmatTransfer : IUnknown {
 /// Element-wise copy and conversion between two layouts. A new object for each use; it has no state.
 /// Both conversions take any strides; a rectangle that leaves the source or lands outside the destination is
 /// E_INVALIDARG before anything is written; a region of non-positive width or height is an empty success. Null data
-/// is E_POINTER unless the region is empty. Source and target may be the same pixels; what else overlaps gives no
-/// defined values.
+/// is E_POINTER unless the region is empty. Source and target may be the same memory with the same strides; what
+/// overlaps otherwise gives no defined values.
 struct IPixmatConverter : IUnknown {
     static constexpr GUID iid = guid("5a1e0000-0207-4000-8000-00000000c0de");
     static constexpr const char* interface_name = "IPixmatConverter";
