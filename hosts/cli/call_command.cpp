@@ -59,13 +59,17 @@ public:
         throw usage_error(name_ + " has no argument '" + name + "'" + near_misses(name, known) + hint());
     }
 
-    /// Values for the call; null where an optional argument is left out.
-    std::vector<std::unique_ptr<argument_source>> sources(const read_options& options) const
+    void check_complete() const
     {
         for (size_t i = 0; i < inputs_.size(); ++i)
             if (!inputs_[i]->optional && (!texts_[i] || *texts_[i] == "-"))
                 throw usage_error(name_ + " needs " + inputs_[i]->name + " (" + inputs_[i]->type_name + ")" +
                                   hint());
+    }
+
+    /// Values for the call; null where an optional argument is left out.
+    std::vector<std::unique_ptr<argument_source>> sources(const read_options& options) const
+    {
         std::vector<std::unique_ptr<argument_source>> all(inputs_.size());
         for (size_t i = 0; i < inputs_.size(); ++i)
             if (texts_[i] && *texts_[i] != "-") all[i] = parse_argument(*inputs_[i], *texts_[i], options);
@@ -128,6 +132,7 @@ public:
     {
         given_texts texts(*method_, name_);
         take(rest, texts);
+        texts.check_complete();
         check_output();
         sources_ = texts.sources(options_.reading);
         int frames = 1;

@@ -1,12 +1,13 @@
 // The program `zelt`: exit status 0, 1 when the work failed, 2 when the command was not understood.
 #include "commands.h"
+#include "facets.h"
 #include "failure.h"
 #include "image_pixels.h"
 #include "output_file.h"
 
+#include <algorithm>
 #include <csignal>
 #include <cstdio>
-#include <cstring>
 #include <iostream>
 #include <unistd.h>
 
@@ -46,6 +47,16 @@ extern "C" void on_divide_fault(int)
     _exit(1);
 }
 
+/// A misspelt command is told as one.
+void require_command(const CLI::App& app, const std::string& name)
+{
+    std::vector<std::string> known;
+    for (const CLI::App* command : app.get_subcommands({})) known.push_back(command->get_name());
+    if (std::ranges::find(known, name) == known.end())
+        throw usage_error("there is no command '" + name + "'" + near_misses(name, known) +
+                          " (zelt --help tells more)");
+}
+
 int run(int argc, char** argv)
 {
     CLI::App app("Image processing for instruments, from the command line.", "zelt");
@@ -54,6 +65,7 @@ int run(int argc, char** argv)
     app.require_subcommand(1);
     app.get_formatter()->column_width(28);
     command_registration::add_all(app);
+    if (argc > 1 && argv[1][0] != '-') require_command(app, argv[1]);
     try {
         app.parse(argc, argv);
     } catch (const CLI::ParseError& e) {

@@ -163,6 +163,14 @@ std::string join(const List& list, const char* between,
     return all;
 }
 
+std::string enclosed(char open, const std::string& text, char close)
+{
+    std::string all(1, open);
+    all += text;
+    all += close;
+    return all;
+}
+
 std::string object_text(IDispatch* object)
 {
     const interface_info* table = table_of(object);
@@ -183,13 +191,13 @@ std::string object_json(IDispatch* object)
     const interface_info* table = table_of(object);
     if (!table) return "null";
     if (const auto items = items_of(object, *table))
-        return "[" + join(*items, ", ", [](const variant& v) { return value_json(*v.get()); }) + "]";
+        return enclosed('[', join(*items, ", ", [](const variant& v) { return value_json(*v.get()); }), ']');
     const auto properties = shown_properties(*table);
     const bool bare = is_tuple(*table);
     const std::string inside = join(properties, ", ", [&](const method_info* m) {
         return (bare ? "" : json_string(m->name) + ": ") + value_json(*get_late(object, *m).get());
     });
-    return (bare ? "[" : "{") + inside + (bare ? "]" : "}");
+    return bare ? enclosed('[', inside, ']') : enclosed('{', inside, '}');
 }
 
 com_ptr<IDispatch> object_in(const VARIANT& v) { return query<IDispatch>(v.punkVal); }
