@@ -30,9 +30,8 @@ constexpr class_entry zelt2_no_dispatch{CLSID_ZELT2NoDispatch, nullptr, nullptr,
 constexpr class_entry complex{CLSID_Complex, "ZELT.Complex.1", "ZELT.Complex", "Complex Class",
                               create_complex};
 
-const class_registration registrations[] = {class_registration(zelt), class_registration(zelt2),
-                                            class_registration(zelt2_no_dispatch),
-                                            class_registration(complex)};
+class_registration registrations[] = {class_registration(zelt), class_registration(zelt2),
+                                      class_registration(zelt2_no_dispatch), class_registration(complex)};
 
 } // namespace
 } // namespace Qor::Luxar::ZELT

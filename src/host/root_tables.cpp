@@ -57,16 +57,3 @@ const interface_info& table_of<IZELT2>() noexcept
 }
 
 } // namespace Qor
-
-#if !__has_include("statistics/statistics.h") // TEMPORARY
-namespace Qor {
-namespace {
-constexpr std::tuple<> no_rows;
-}
-template <>
-const interface_info& table_of<IStatistics>() noexcept
-{
-    return interface_table<IStatistics, no_rows>::info("");
-}
-} // namespace Qor
-#endif

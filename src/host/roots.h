@@ -10,10 +10,7 @@
 #include "frame/operation.h"
 #include "geometry/geometry.h"
 #include "morphology/morphology.h"
-#if __has_include("statistics/statistics.h") // TEMPORARY
 #include "statistics/statistics.h"
-#define HAVE_statistics 1
-#endif
 #include "threads/cancellation.h"
 #include "utilities/utilities.h"
 #include "zelt/interfaces/zelt.h"
@@ -22,11 +19,8 @@
 
 namespace Qor::Luxar::ZELT {
 
-#ifndef HAVE_statistics
-class CStatistics : public automation<IStatistics> {};
-#endif
 /// What all roots do: keep the rounding mode, make facets at first use and keep them.
-template <class Base, class Root, const GUID& ClassId>
+template <class Base, class Root>
 class root_object : public Base {
 public:
     explicit root_object(IUnknown* outer) noexcept : Base(outer) {}
@@ -41,8 +35,8 @@ public:
     HRESULT put_Rounding(ZELT_Rounding mode) noexcept override
     {
         if (mode == ZELT_Rounding_Default)
-            return ReportError(
-                ClassId,
+            return ReportError( // the second generation speaks for both
+                CLSID_ZELT2,
                 L"ZELT_Rounding_Default specified for entire library - should be specific rounding mode",
                 Root::iid, E_INVALIDARG);
         rounding_ = mode;
@@ -83,7 +77,7 @@ using scripted_root =
 template <class Interface>
 using plain_root = dispatching<aggregatable<Interface>, Interface>;
 
-class CZelt final : public root_object<scripted_root<IZELT>, IZELT, CLSID_ZELT> {
+class CZelt final : public root_object<scripted_root<IZELT>, IZELT> {
 public:
     using root_object::root_object;
 
@@ -147,10 +141,10 @@ template <class Facet>
 using plain = Facet;
 
 /// The second generation, whose facets are made in the given form.
-template <template <class> class Form, class Base, const GUID& ClassId>
-class zelt2_root : public root_object<Base, IZELT2, ClassId> {
+template <template <class> class Form, class Base>
+class zelt2_root : public root_object<Base, IZELT2> {
 public:
-    using root_object<Base, IZELT2, ClassId>::root_object;
+    using root_object<Base, IZELT2>::root_object;
 
     HRESULT get_Basic(IBasicOps2** facet) noexcept override
     {
@@ -226,7 +220,7 @@ private:
     com_ptr<IFourier> fourier_;
 };
 
-using CZelt2 = zelt2_root<scripting, scripted_root<IZELT2>, CLSID_ZELT2>;
-using CZelt2NoDispatch = zelt2_root<plain, plain_root<IZELT2>, CLSID_ZELT2NoDispatch>;
+using CZelt2 = zelt2_root<scripting, scripted_root<IZELT2>>;
+using CZelt2NoDispatch = zelt2_root<plain, plain_root<IZELT2>>;
 
 } // namespace Qor::Luxar::ZELT

@@ -113,9 +113,9 @@ void expect_default_refused(const GUID& class_id, const wchar_t* source)
 
 TEST(Roots, RefuseTheDefaultRounding)
 {
-    expect_default_refused<IZELT>(CLSID_ZELT, L"ZELT.Main");
+    expect_default_refused<IZELT>(CLSID_ZELT, L"ZELT.Main2");
     expect_default_refused<IZELT2>(CLSID_ZELT2, L"ZELT.Main2");
-    expect_default_refused<IZELT2>(CLSID_ZELT2NoDispatch, L"");
+    expect_default_refused<IZELT2>(CLSID_ZELT2NoDispatch, L"ZELT.Main2");
 }
 
 TEST(Roots, NamesLeadToTheirClasses)
