@@ -218,6 +218,10 @@ protected:
             std::memcpy(&v, memory + shift + layout.offset + y * layout.y_stride + x * layout.x_stride, 2);
             return v;
         }
+        void set(int x, int y, uint16_t v)
+        {
+            std::memcpy(memory + y * layout.y_stride + x * layout.x_stride, &v, 2);
+        }
     };
     operand long_exposure{PixmatEncoding_Unsigned, 1}, brief{PixmatEncoding_Unsigned, 2},
         dark{PixmatEncoding_Signed, 3}, gain{PixmatEncoding_Unsigned, 4}, dst{PixmatEncoding_Signed, 5};
@@ -276,6 +280,7 @@ TEST_F(LanesOfFlattenDouble, FollowTheirOwnArithmetic)
         for (const int32_t s : {2, 3, 8, 15, 16, 17, 40, 1000})
             for (const double k : ratios) {
                 long_exposure.layout.bits = brief.layout.bits = bits;
+                long_exposure.set(5, 1, static_cast<uint16_t>(saturated())); // a tie
                 scale = s;
                 ratio = k;
                 expect_lanes("bits, scale and ratio");
@@ -293,9 +298,11 @@ TEST_F(LanesOfFlattenDouble, EndWhereOneConditionFails)
     operand* const all[] = {&dark, &gain, &long_exposure, &brief, &dst};
     with("scale", [&] { scale = 1; });
     with("negative scale", [&] { scale = -3; });
-    with("size", [&] {
-        for (auto* o : all) o->layout = {15, 3, 16, o->layout.encoding, 0, 2, 30};
-    });
+    for (const size uneven : {size{15, 3}, size{6, 2}})
+        with("size", [&] {
+            for (auto* o : all)
+                o->layout = packed_layout(uneven.width, uneven.height, 16, o->layout.encoding);
+        });
     with("exposures' x stride", [&] { long_exposure.layout.x_stride = brief.layout.x_stride = 4; });
     with("exposures' offset", [&] { long_exposure.layout.offset = brief.layout.offset = 16; });
     with("exposures' rows", [&] { long_exposure.layout.y_stride = brief.layout.y_stride = 48; });
