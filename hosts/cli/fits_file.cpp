@@ -150,7 +150,8 @@ private:
         const bool compressed = fits_is_compressed_image(file_.get(), &status) != 0;
         const int64_t frame = int64_t{width_} * height_;
         const int64_t least = compressed ? 1 : std::abs(stored) / 8;
-        const bool there = compressed ? can_expand(file_size_, frame) : frame <= file_size_ / frames_ / least;
+        const bool there = compressed ? can_expand(file_size_, static_cast<double>(frame))
+                                      : frame <= file_size_ / frames_ / least;
         if (!there)
             throw failure("the file is too small for " + std::to_string(width_) + " x " +
                           std::to_string(height_) + " pixels in " + std::to_string(frames_) + " frames");

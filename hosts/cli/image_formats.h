@@ -18,14 +18,13 @@ std::unique_ptr<frame_writer> create_fits(const std::string& path);
 /// One page of a TIFF file that is not simply rows of pixels: compressed, tiled, with a palette.
 com_ptr<IPixmat2> decode_tiff_page(const std::string& path, int page);
 
-/// No compressor makes more of a byte than this. What claims to be larger is damaged, or meant to fill the memory.
-inline constexpr int64_t highest_compression = 4096;
-inline constexpr int64_t least_claim = 1 << 20; ///< not worth a refusal
-
-/// Whether `bytes` of pixels can come from `stored` bytes of a file.
-constexpr bool can_expand(int64_t stored, int64_t bytes) noexcept
+/// Whether so many bytes of pixels can come from `stored` bytes of a file. No compressor makes more of a byte; what
+/// claims to be larger is damaged, or meant to fill the memory. (In real numbers: claims may be beyond any integer.)
+constexpr bool can_expand(int64_t stored, double bytes) noexcept
 {
-    return bytes <= least_claim || bytes / highest_compression <= stored;
+    constexpr double highest_compression = 4096;
+    constexpr double not_worth_a_refusal = 1 << 20;
+    return bytes <= not_worth_a_refusal || bytes / highest_compression <= static_cast<double>(stored);
 }
 
 } // namespace cli

@@ -7,6 +7,7 @@
 #include <cerrno>
 #include <cstdio>
 #include <cstring>
+#include <iostream>
 #include <opencv2/core.hpp>
 #include <opencv2/core/utils/logger.hpp>
 #include <opencv2/imgcodecs.hpp>
@@ -17,12 +18,37 @@ using namespace Qor::Luxar;
 namespace cli {
 namespace {
 
-/// Runs a codec: silent, and what it throws becomes a failure.
+/// The codecs write about damaged files to the standard error stream, beside what they throw. One message is enough,
+/// and it comes from here. (The file descriptor stays: what is fatal is still told.)
+class quiet_codecs {
+public:
+    quiet_codecs() : nowhere_(std::fopen("/dev/null", "w")), errors_(std::cerr.rdbuf(nullptr))
+    {
+        cv::utils::logging::setLogLevel(cv::utils::logging::LOG_LEVEL_SILENT);
+        cv::redirectError([](int, const char*, const char*, const char*, int, void*) { return 0; });
+        if (nowhere_) std::swap(stderr, nowhere_);
+    }
+    ~quiet_codecs()
+    {
+        if (nowhere_) {
+            std::swap(stderr, nowhere_);
+            std::fclose(nowhere_);
+        }
+        std::cerr.rdbuf(errors_);
+    }
+    quiet_codecs(const quiet_codecs&) = delete;
+    quiet_codecs& operator=(const quiet_codecs&) = delete;
+
+private:
+    FILE* nowhere_;
+    std::streambuf* errors_;
+};
+
+/// Runs a codec; what it throws becomes a failure.
 template <class Body>
 void with_codec(Body&& body)
 {
-    cv::utils::logging::setLogLevel(cv::utils::logging::LOG_LEVEL_SILENT);
-    cv::redirectError([](int, const char*, const char*, const char*, int, void*) { return 0; });
+    const quiet_codecs quiet;
     try {
         body();
     } catch (const cv::Exception& e) {
@@ -82,7 +108,8 @@ void check_png(const std::vector<uint8_t>& file)
     const int64_t height = big_endian_32(file.data() + 20);
     if (width < 1 || height < 1 || width > INT32_MAX || height > INT32_MAX)
         throw failure("has no usable width and height");
-    if (!can_expand(static_cast<int64_t>(file.size()), (width + 7) / 8 * height * file[24]))
+    if (!can_expand(static_cast<int64_t>(file.size()),
+                    static_cast<double>(width) * static_cast<double>(height) * file[24] / 8))
         throw failure("the file is too small for " + std::to_string(width) + " x " + std::to_string(height) +
                       " pixels");
     for (size_t at = signature; file.size() - at >= around;) {

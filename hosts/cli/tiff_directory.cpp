@@ -31,11 +31,18 @@ size_t size_of_type(uint16_t type)
 
 } // namespace
 
-tiff_directory::tiff_directory(const std::string& path)
+tiff_directory::open_file::open_file(const std::string& path)
+    : number(open(path.c_str(), O_RDONLY | O_CLOEXEC))
 {
-    file_ = open(path.c_str(), O_RDONLY | O_CLOEXEC);
+    if (number < 0) throw failure(std::strerror(errno));
+}
+
+tiff_directory::open_file::~open_file() { close(number); }
+
+tiff_directory::tiff_directory(const std::string& path) : file_(path)
+{
     struct stat status = {};
-    if (file_ < 0 || fstat(file_, &status) != 0) throw failure(std::strerror(errno));
+    if (fstat(file_.number, &status) != 0) throw failure(std::strerror(errno));
     file_size_ = static_cast<uint64_t>(status.st_size);
 
     char order[2];
@@ -57,17 +64,12 @@ tiff_directory::tiff_directory(const std::string& path)
     if (directories_.empty()) throw failure("holds no image");
 }
 
-tiff_directory::~tiff_directory()
-{
-    if (file_ >= 0) close(file_);
-}
-
 void tiff_directory::read_at(uint64_t offset, void* data, size_t size) const
 {
     if (offset > file_size_ || size > file_size_ - offset) truncated();
     auto* bytes = static_cast<char*>(data);
     while (size > 0) {
-        const ssize_t got = pread(file_, bytes, size, static_cast<off_t>(offset));
+        const ssize_t got = pread(file_.number, bytes, size, static_cast<off_t>(offset));
         if (got < 0 && errno == EINTR) continue;
         if (got < 0) throw failure(std::strerror(errno));
         if (got == 0) truncated();

@@ -60,9 +60,6 @@ class tiff_directory {
 public:
     /// Follows the chain of directories to its end. Throws failure for a file whose structure is damaged.
     explicit tiff_directory(const std::string& path);
-    ~tiff_directory();
-    tiff_directory(const tiff_directory&) = delete;
-    tiff_directory& operator=(const tiff_directory&) = delete;
 
     int count() const noexcept { return static_cast<int>(directories_.size()); }
     /// Every strip and tile lies inside the file.
@@ -88,7 +85,15 @@ private:
     std::vector<uint64_t> numbers(const entry& e, uint64_t most) const;
     void place(const entry& e, tiff_page& page) const;
 
-    int file_ = -1;
+    struct open_file {
+        explicit open_file(const std::string& path);
+        ~open_file();
+        open_file(const open_file&) = delete;
+        open_file& operator=(const open_file&) = delete;
+        int number;
+    };
+
+    open_file file_;
     uint64_t file_size_ = 0;
     bool big_endian_ = false;
     bool big_tiff_ = false;

@@ -108,7 +108,8 @@ private:
         if (!page.equal_bits || (!small_integers && !floats))
             throw failure("compressed, tiled or unusual TIFF with " + samples_name(page) +
                           " is not supported");
-        if (!can_expand(page.stored_bytes(), page.width * page.height / 8 * page.bits * page.samples))
+        const double pixels = static_cast<double>(page.width) * static_cast<double>(page.height);
+        if (!can_expand(page.stored_bytes(), pixels / 8 * page.bits * page.samples))
             throw failure("the file is too small for " + std::to_string(page.width) + " x " +
                           std::to_string(page.height) + " pixels");
         const com_ptr<IPixmat2> image = decode_tiff_page(path_, index);
