@@ -28,7 +28,7 @@ com_ptr<IPixmat2> constant(size s, PixmatEncoding encoding, T value, int32_t bit
     EXPECT_EQ(CreateImageFromLayout(packed_layout(s.width, s.height, bits, encoding), image.put()), S_OK);
     ImageWriteAccess access(image.get());
     for (int i = 0; i < s.width * s.height; ++i)
-        std::memcpy(access.view().data + i * sizeof(T), &value, sizeof(T));
+        std::memcpy(access.view().data + i * int(sizeof(T)), &value, sizeof(T));
     EXPECT_EQ(access.Commit(), S_OK);
     return image;
 }
@@ -229,7 +229,7 @@ TEST(FlatFieldingByName, TakesTheDocumentedDefaults)
     const auto late = [&](size_t method, std::vector<variant> arguments) {
         variant result;
         const auto& m = table_of<IFlatFielding>().methods[method];
-        EXPECT_EQ(call_late(facet.get(), m, arguments, &result), S_OK) << m.name;
+        EXPECT_EQ(late_call(facet.get(), m, arguments)(&result), S_OK) << m.name;
         return result;
     };
     const auto image = [](const com_ptr<IPixmat2>& i) { return variant(i.get()); };
