@@ -1,8 +1,9 @@
 #include "conversions/conversions.h"
 
-#include "conversions/regions.h"
+#include "conversions/overlap.h"
 #include "frame/operation.h"
 #include "frame/value_objects.h"
+#include "pixmat/image.h"
 
 namespace Qor::Luxar::ZELT {
 namespace {
@@ -30,29 +31,64 @@ bool equal_formats(const image_layout& a, const image_layout& b)
            GetPixelType(a.encoding, a.bits) == GetPixelType(b.encoding, b.bits);
 }
 
+com_ptr<IPixmatLock> open_write(IPixmat2* image)
+{
+    com_ptr<IPixmatLock> lock;
+    CheckHResult(image->OpenWrite(lock.put()));
+    return lock;
+}
+
+/// Writes a region to an image of its own and then to its place, when the source is in the way.
+/// `write` takes the target and a point in it.
+template <class Write>
+HRESULT write_aside(Write&& write, const image_pixels& to, const rectangle& place)
+{
+    image_pixels part = to;
+    part.layout.width = place.right - place.left;
+    part.layout.height = place.bottom - place.top;
+    part.data += int64_t{place.left} * to.layout.x_stride + int64_t{place.top} * to.layout.y_stride;
+
+    com_ptr<IPixmat2> image;
+    CheckHResult(create_packed_image(part.layout, pixel_buffer::zeroed, image.put()));
+    const com_ptr<IPixmatLock> lock = open_write(image.get());
+    const image_pixels aside{
+        packed_layout(part.layout.width, part.layout.height, to.layout.bits, to.layout.encoding),
+        lock->Data(0)};
+    const HRESULT hr = write(aside, coordinate<int32_t>{});
+    if (succeeded(hr)) copy_pixels(part.layout, part.data, aside.layout, aside.data);
+    return hr;
+}
+
 HRESULT convert(const conversion& how, IPixmat2* dst, IPixmat2* src, IRectangle* area, ICoordinateInt* point)
 {
     if (!dst || !src) return E_INVALIDARG;
-    image_layout to;
-    image_layout from;
-    CheckHResult(ReadLayout(dst, &to));
-    CheckHResult(ReadLayout(src, &from));
+    image_pixels to{};
+    image_pixels from{};
+    CheckHResult(ReadLayout(dst, &to.layout));
+    CheckHResult(ReadLayout(src, &from.layout));
     const optional_rectangle src_area(area);
     const optional_point dst_point(point);
 
     com_ptr<IPixmatLock> reading;
-    com_ptr<IPixmatLock> writing;
     CheckHResult(src->OpenRead(area, 1.0, reading.put()));
-    CheckHResult(dst->OpenWrite(writing.put()));
+    const com_ptr<IPixmatLock> writing = open_write(dst);
+    from.data = reading->Data(0);
+    to.data = writing->Data(0);
 
-    if (how.copies_equal_formats && !area && !point && equal_formats(to, from)) {
-        copy_pixels(to, writing->Data(0), from, reading->Data(0));
-        return writing->Commit(nullptr);
-    }
-    const conversion_regions regions = compute_regions(from, to, src_area.get(), dst_point.get());
-    const auto converter = create_instance<IPixmatConverter>(CLSID_PixmatConverter);
-    const HRESULT hr = (converter.get()->*how.operation)(from, reading->Data(0), to, writing->Data(0),
-                                                         &regions.source, &regions.target_point);
+    const conversion_regions regions =
+        compute_regions(from.layout, to.layout, src_area.get(), dst_point.get());
+    com_ptr<IPixmatConverter> converter;
+    if (!how.copies_equal_formats || area || point || !equal_formats(to.layout, from.layout))
+        converter = create_instance<IPixmatConverter>(CLSID_PixmatConverter);
+    const auto write = [&](const image_pixels& target, const coordinate<int32_t>& place) -> HRESULT {
+        if (converter)
+            return (converter.get()->*how.operation)(from.layout, from.data, target.layout, target.data,
+                                                     &regions.source, &place);
+        copy_pixels(target.layout, target.data, from.layout, from.data);
+        return S_OK;
+    };
+    const HRESULT hr = writes_over_source(from, to, regions) ? write_aside(write, to, regions.target)
+                                                             : write(to, regions.target_point);
     return failed(hr) ? hr : writing->Commit(&regions.target);
 }
 

@@ -14,7 +14,7 @@ namespace Qor::Luxar::ZELT {
 ///            opposite replaces (is not added to) the area's left or top; scripts rely on this. An area that is empty
 ///            after clipping is a success that changes nothing.
 /// Changed    the destination rectangle is announced as the changed region.
-/// In place   allowed; source and destination may be one image when every pixel lands on itself.
+/// In place   allowed, also where regions overlap or two images share memory: the result is that of separate images.
 struct IConversions2 : IDispatch {
     static constexpr GUID iid = guid("5a1e0000-0331-4000-8000-00000000c0de");
     static constexpr const char* interface_name = "IConversions2";
