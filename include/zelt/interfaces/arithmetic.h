@@ -1,20 +1,196 @@
-// Pixel-wise operations.
+// Pixel-wise operations: an image with a second image or a number.
 #pragma once
 
-#include "zelt/com/dispatch.h"
+#include "zelt/interfaces/enums.h"
+#include "zelt/pixmat/pixmat.h"
 
 namespace Qor::Luxar::ZELT {
 
-struct IBasicOps : IDispatch {
-    static constexpr GUID iid = guid("5a1e0000-0340-4000-8000-00000000c0de");
-    static constexpr const char* interface_name = "IBasicOps";
-    using base = IDispatch;
+/// Where the first generation's AddOffset puts the second image.
+enum ZELT_Offset : int32_t {
+    ZELT_Offset_Integer = 0,  ///< at whole pixels: the position is rounded down
+    ZELT_Offset_SubPixel = 1, ///< between pixels
 };
 
+/// What Extend puts where the image has no pixel. Only the first is there.
+enum ZELT_BoundaryCondition : int32_t {
+    ZELT_BoundaryCondition_ConstantValue = 0,
+    ZELT_BoundaryCondition_RepeatBorderPixels = 1,
+    ZELT_BoundaryCondition_Reflective = 2,
+    ZELT_BoundaryCondition_Periodic = 3,
+    ZELT_BoundaryCondition_Taper = 4,
+};
+
+enum ZELT_AutoThreshold_Method : int32_t {
+    ZELT_AutoThreshold_Basic_Global = 0,
+};
+
+/// Combines images with images and numbers, pixel by pixel.
+/// What holds for Add, Subtract, ReverseSubtract, Multiply, Divide, ReverseDivide, Min, Max and SetTo:
+/// Pixels     Unsigned and Signed of up to 32 bits (stored in one, two or four bytes; one that lies closer to its
+///            neighbour than its storage is refused), Float 32 and 64, Complex_Float and both half-complex
+///            encodings of 64 and 128 bits, and RGB, RGBA, BGR as told below. The result has the type of the
+///            output; a new output has the descriptor of the first operand, nominal bits included.
+/// Arguments  pIA: the first operand. b: the second one, an image of the same size; or VT_I1, VT_UI1, VT_I2,
+///            VT_UI2, VT_I4, VT_UI4, VT_R4, VT_R8 and nothing else for real images; for complex ones also an
+///            IComplex or a one-dimensional array of two VT_R4 or VT_R8, real part first. pIOutImg: receives the
+///            result, if given. ppIOut: may be null then.
+/// Types      Images: the output must have the encoding and bits of pIA, or else of b, and the size of pIA. Two
+///            integers are computed in 32 bits, as signed numbers when both are Signed, else as unsigned ones:
+///            negative numbers then count as huge. An integer or Float 32 with Float 32 is computed in float,
+///            anything with Float 64 in double. A complex output takes complex numbers of either width and Float,
+///            as real part, and computes in its own width.
+///            Numbers: a number counts as an image of its type. The output may be larger than pIA, its other
+///            pixels stay; it may have any real type when pIA is Unsigned or Float, else that of pIA.
+/// Rounding   Fastest and Wrap: integers keep their low bits, in the width of the storage. Real values go through
+///            truncation to 64 bits (0 for NaN and what lies beyond). Float outputs get the value itself.
+///            Saturate: limited to the nominal range of the output (12 bits: 0 to 4095), Float to 0 to 1; a value
+///            that is not >= the lower limit becomes the lower limit, so does NaN. The comparison is that of the
+///            computing type: in unsigned 32 bits 5 - 10 becomes the upper limit of an unsigned type, and an
+///            Unsigned operand turns small positive results of a Signed output into its lower limit. Float 32
+///            knows the limits of 32-bit integers rounded up by one; that one keeps its low bits too.
+///            32-bit integers overflow by wrapping in every mode. Complex outputs ignore the mode.
+/// Complex    (a + ib)(c + id) is (ac - bd) + i(bc + ad); (a + ib) / (c + id) is
+///            (ac + bd) / (cc + dd) + i(bc - ad) / (cc + dd), each product and sum rounded as it stands.
+/// Spectra    A half-complex pIA with a complex number (or array), or with an image that is not half-complex, is
+///            first expanded (IFourier::ExpandHalfComplex) into a new Complex_Float image of its full width, which
+///            then also is the output: pIOutImg is not used, and a call that only names pIOutImg changes nothing.
+/// Colour     An RGB, RGBA or BGR output takes the other operand in Float: it is truncated to one byte and acts on
+///            each of the three colour bytes, which wrap. A fourth byte stays. There is no colour with numbers.
+/// Division   A ZERO DIVISOR IN INTEGER ARITHMETIC IS A PROCESSOR FAULT (SIGFPE), NOT AN ERROR CODE: never divide
+///            by an integer image with zero pixels, or by 0 (ReverseDivide: never give such a pIA). Integers are
+///            truncated toward zero, floats follow IEEE.
+/// In place   the output may be either operand: it is then opened for writing only.
+/// NaN        Min and Max give the first operand when one of both is NaN.
+/// Threads    everything runs on the calling thread.
+/// Fails      in this order, without text where none is told; nothing is written:
+///            E_INVALIDARG for a null pIA; E_POINTER for no pIOutImg and no ppIOut;
+///            the answer to the query, "Right argument must be scalar or IPixmat2", for an object that is neither
+///            image nor IComplex (E_POINTER for a null one);
+///            E_NOTIMPL "Half-complex image must be first operand";
+///            E_INVALIDARG "Can't operate on images of different size";
+///            E_INVALIDARG for an output of another size (images), E_NOTIMPL for a smaller one (numbers);
+///            E_INVALIDARG "Supplied destination image must have same type as at least one of the arguments";
+///            E_INVALIDARG for any other combination of types, Min and Max of complex ones among them;
+///            E_UNEXPECTED for a rounding mode that is none. What an image answers comes back unchanged.
 struct IBasicOps2 : IDispatch {
     static constexpr GUID iid = guid("5a1e0000-0341-4000-8000-00000000c0de");
     static constexpr const char* interface_name = "IBasicOps2";
     using base = IDispatch;
+
+    /// pIA + b
+    virtual HRESULT Add(IPixmat2* pIA, VARIANT b, IPixmat2* pIOutImg, IPixmat2** ppIOut) noexcept = 0;
+    /// pIA - b
+    virtual HRESULT Subtract(IPixmat2* pIA, VARIANT b, IPixmat2* pIOutImg, IPixmat2** ppIOut) noexcept = 0;
+    /// b - pIA
+    virtual HRESULT ReverseSubtract(IPixmat2* pIA, VARIANT b, IPixmat2* pIOutImg,
+                                    IPixmat2** ppIOut) noexcept = 0;
+    /// pIA * b
+    virtual HRESULT Multiply(IPixmat2* pIA, VARIANT b, IPixmat2* pIOutImg, IPixmat2** ppIOut) noexcept = 0;
+    /// pIA / b. A zero in an integer b is a processor fault.
+    virtual HRESULT Divide(IPixmat2* pIA, VARIANT b, IPixmat2* pIOutImg, IPixmat2** ppIOut) noexcept = 0;
+    /// b / pIA. A zero in an integer pIA is a processor fault.
+    virtual HRESULT ReverseDivide(IPixmat2* pIA, VARIANT b, IPixmat2* pIOutImg,
+                                  IPixmat2** ppIOut) noexcept = 0;
+
+    /// Fills an image, or a rectangle of it, with a number or with the pixels of another image.
+    /// Arguments  b: as above; an image has the size of the rectangle. pIRect: null means the whole image.
+    /// Values     as by Add under Fastest: 300 is 44 in 8 bits.
+    /// In place   always. A half-complex image with a complex number is expanded like any other pIA, so that the
+    ///            call has no effect.
+    /// Fails      E_POINTER for a null image; E_INVALIDARG for a rectangle that leaves it; then as above.
+    virtual HRESULT SetTo(IPixmat2* pIImg, VARIANT b, IRectangle* pIRect) noexcept = 0;
+
+    virtual HRESULT AddOffset(IPixmat2* pIA, IPixmat2* pIB, ICoordinateFloat* pIPos, double fa,
+                              double fb) noexcept = 0;
+    virtual HRESULT AddIntegerOffset(IPixmat2* pIA, IPixmat2* pIB, ICoordinateInt* pIPos, double fa,
+                                     double fb, IPixmat2* pIOut, IPixmat2** ppIOut) noexcept = 0;
+
+    /// The lesser of pIA and b, always under Fastest. No complex images.
+    virtual HRESULT Min(IPixmat2* pIA, VARIANT b, IPixmat2* pIOutImg, IPixmat2** ppIOut) noexcept = 0;
+    /// The greater of pIA and b, always under Fastest. No complex images.
+    virtual HRESULT Max(IPixmat2* pIA, VARIANT b, IPixmat2* pIOutImg, IPixmat2** ppIOut) noexcept = 0;
+
+    virtual HRESULT Abs(IPixmat2* pIImage, IPixmat2* pIOutImg, IPixmat2** ppIOut) noexcept = 0;
+    virtual HRESULT Threshold(IPixmat2* pIImage, VARIANT lowLimit, VARIANT lowValue, VARIANT highLimit,
+                              VARIANT highValue, IPixmat2* pIOutImg, IPixmat2** ppIOut) noexcept = 0;
+    virtual HRESULT Normalize(IPixmat2* pIImage, double low, double high, IPixmat2* pIOutImg,
+                              IPixmat2** ppIOut) noexcept = 0;
+    virtual HRESULT Equals(IPixmat2* pIImgA, IPixmat2* pIImgB, VARIANT_BOOL* pResult) noexcept = 0;
+    virtual HRESULT AutoThreshold(IPixmat2* pIImage, VARIANT belowValue, VARIANT aboveValue,
+                                  ZELT_AutoThreshold_Method method, IPixmat2* pIOutImg,
+                                  IPixmat2** ppIOut) noexcept = 0;
+    virtual HRESULT Margins(IPixmat2* pIImage, LONG imgMargins, IPixmat2* pIOutImg,
+                            IPixmat2** ppIOut) noexcept = 0;
+    virtual HRESULT Combine(IPixmat2* pIBaseImage, IPixmat2* pICombineImage, IPixmat2* pIWeightMask,
+                            IPixmat2* pIOutImg, IPixmat2** ppIOut) noexcept = 0;
+    virtual HRESULT Exp(IPixmat2* pIImage, IPixmat2* pIOutImg, IPixmat2** ppIOut) noexcept = 0;
+    virtual HRESULT Log(IPixmat2* pIImage, IPixmat2* pIOutImg, IPixmat2** ppIOut) noexcept = 0;
+    virtual HRESULT Modulate(IPixmat2* pIImage, IPixmat2* pIMask, double weight, IPixmat2* pIOutImage,
+                             IPixmat2** ppIOut) noexcept = 0;
+    virtual HRESULT Extend(IPixmat2* pIImage, IRectangle* pIExtendedImageDomain,
+                           ZELT_BoundaryCondition boundaryCondition, double padValue, IPixmat2* pIOut,
+                           IPixmat2** ppIPixmat) noexcept = 0;
+    virtual HRESULT Power(IPixmat2* pIA, double exponent, IPixmat2* pIOutImg, IPixmat2** ppIOut) noexcept = 0;
+};
+
+/// The first generation: in place, or (Ex) into a new image. What IBasicOps2 says of each operation holds.
+/// Arguments  r: a rounding mode for this call; 0 means that of the facet. A mode given here is set on the facet
+///            for the length of the call: do not call one facet from two threads with different modes.
+///            pIOutDescr: what the new image is made from; null means the descriptor of the first operand.
+/// Spectra    what IBasicOps2 expands comes back from Ex as a new full image; in place it is lost, and nothing
+///            changes.
+/// Fails      E_INVALIDARG for a null image; Ex: E_POINTER for a null ppIOut; E_INVALIDARG with the text told
+///            for a descriptor of another size; then as IBasicOps2.
+struct IBasicOps : IDispatch {
+    static constexpr GUID iid = guid("5a1e0000-0340-4000-8000-00000000c0de");
+    static constexpr const char* interface_name = "IBasicOps";
+    using base = IDispatch;
+
+    virtual HRESULT Add(IPixmat2* pIA, VARIANT b, ZELT_Rounding r) noexcept = 0;
+    /// "Requested output image of addition has different size"
+    virtual HRESULT AddEx(IPixmat2* pIA, VARIANT b, ZELT_Rounding r, IPixmatDescriptor* pIOutDescr,
+                          IPixmat2** ppIOut) noexcept = 0;
+    virtual HRESULT Subtract(IPixmat2* pIA, VARIANT b, ZELT_Rounding r) noexcept = 0;
+    /// "Requested output image of subtraction has different size"
+    virtual HRESULT SubtractEx(IPixmat2* pIA, VARIANT b, ZELT_Rounding r, IPixmatDescriptor* pIOutDescr,
+                               IPixmat2** ppIOut) noexcept = 0;
+    virtual HRESULT ReverseSubtract(IPixmat2* pIA, VARIANT b, ZELT_Rounding r) noexcept = 0;
+    /// "Requested output image of subtraction has different size"
+    virtual HRESULT ReverseSubtractEx(IPixmat2* pIA, VARIANT b, ZELT_Rounding r,
+                                      IPixmatDescriptor* pIOutDescr, IPixmat2** ppIOut) noexcept = 0;
+    virtual HRESULT Multiply(IPixmat2* pIA, VARIANT b, ZELT_Rounding r) noexcept = 0;
+    /// "Requested output image of multiplication has different size"
+    virtual HRESULT MultiplyEx(IPixmat2* pIA, VARIANT b, ZELT_Rounding r, IPixmatDescriptor* pIOutDescr,
+                               IPixmat2** ppIOut) noexcept = 0;
+    virtual HRESULT Divide(IPixmat2* pIA, VARIANT b, ZELT_Rounding r) noexcept = 0;
+    /// "Requested output image of division has different size"
+    virtual HRESULT DivideEx(IPixmat2* pIA, VARIANT b, ZELT_Rounding r, IPixmatDescriptor* pIOutDescr,
+                             IPixmat2** ppIOut) noexcept = 0;
+    virtual HRESULT ReverseDivide(IPixmat2* pIA, VARIANT b, ZELT_Rounding r) noexcept = 0;
+    /// "Requested output image of division has different size"
+    virtual HRESULT ReverseDivideEx(IPixmat2* pIA, VARIANT b, ZELT_Rounding r, IPixmatDescriptor* pIOutDescr,
+                                    IPixmat2** ppIOut) noexcept = 0;
+    virtual HRESULT SetTo(IPixmat2* pIImg, VARIANT b, IRectangle* pIRect) noexcept = 0;
+    virtual HRESULT AddOffset(IPixmat2* pIA, IPixmat2* pIB, ICoordinateFloat* pIPos,
+                              ZELT_Offset mode) noexcept = 0;
+    virtual HRESULT Min(IPixmat2* pIA, VARIANT b) noexcept = 0;
+    /// "Requested output image of min has different size"
+    virtual HRESULT MinEx(IPixmat2* pIA, VARIANT b, IPixmatDescriptor* pIOutDescr,
+                          IPixmat2** ppIOut) noexcept = 0;
+    virtual HRESULT Max(IPixmat2* pIA, VARIANT b) noexcept = 0;
+    /// "Requested output image of max has different size"
+    virtual HRESULT MaxEx(IPixmat2* pIA, VARIANT b, IPixmatDescriptor* pIOutDescr,
+                          IPixmat2** ppIOut) noexcept = 0;
+    virtual HRESULT Abs(IPixmat2* pIImage) noexcept = 0;
+    /// "Requested output image of abs has different size"
+    virtual HRESULT AbsEx(IPixmat2* pIImage, IPixmatDescriptor* pIOutDescr, IPixmat2** ppIOut) noexcept = 0;
+    virtual HRESULT Threshold(IPixmat2* pIImage, VARIANT lowLimit, VARIANT lowValue, VARIANT highLimit,
+                              VARIANT highValue) noexcept = 0;
+    /// "Requested output image of ThresholdEx has different size"
+    virtual HRESULT ThresholdEx(IPixmat2* pIImage, VARIANT lowLimit, VARIANT lowValue, VARIANT highLimit,
+                                VARIANT highValue, IPixmatDescriptor* pIOutDescr,
+                                IPixmat2** ppIOut) noexcept = 0;
 };
 
 struct IMath : IDispatch {
@@ -24,3 +200,34 @@ struct IMath : IDispatch {
 };
 
 } // namespace Qor::Luxar::ZELT
+
+namespace Qor {
+
+template <>
+struct enumeration_of<Luxar::ZELT::ZELT_Offset> {
+    static constexpr enumeration_value values[] = {
+        {"ZELT_Offset_Integer", 0},
+        {"ZELT_Offset_SubPixel", 1},
+    };
+    static constexpr enumeration_info info{"ZELT_Offset", values};
+};
+
+template <>
+struct enumeration_of<Luxar::ZELT::ZELT_BoundaryCondition> {
+    static constexpr enumeration_value values[] = {
+        {"ZELT_BoundaryCondition_ConstantValue", 0}, {"ZELT_BoundaryCondition_RepeatBorderPixels", 1},
+        {"ZELT_BoundaryCondition_Reflective", 2},    {"ZELT_BoundaryCondition_Periodic", 3},
+        {"ZELT_BoundaryCondition_Taper", 4},
+    };
+    static constexpr enumeration_info info{"ZELT_BoundaryCondition", values};
+};
+
+template <>
+struct enumeration_of<Luxar::ZELT::ZELT_AutoThreshold_Method> {
+    static constexpr enumeration_value values[] = {
+        {"ZELT_AutoThreshold_Basic_Global", 0},
+    };
+    static constexpr enumeration_info info{"ZELT_AutoThreshold_Method", values};
+};
+
+} // namespace Qor
