@@ -3,10 +3,11 @@
 
 #include "statistics/kernels/scalar_vectors.inl"
 
-namespace Qor::Luxar::ZELT::ZELT_LEVEL {
+namespace Qor::Luxar::ZELT::ZELT_LEVEL::scalar_statistics {
 
 /// What a block of up to max_block pixels adds to a scan. The weight of a pixel is its place in the block.
-template <class T> struct block_sums {
+template <class T>
+struct block_sums {
     int64_t sum;
     int64_t squares;
     int64_t weighted;
@@ -16,7 +17,8 @@ template <class T> struct block_sums {
 
 inline constexpr int max_block = 8192;
 
-template <class T> block_sums<T> plain_block(const uint8_t* p, int n)
+template <class T>
+block_sums<T> plain_block(const uint8_t* p, int n)
 {
     const T first = load_element<T>(p, 0);
     block_sums<T> result{0, 0, 0, first, first};
@@ -43,7 +45,8 @@ struct raw_sums {
     int64_t weighted;
 };
 
-template <class T> block_sums<T> without_bias(raw_sums raw, int64_t bias, int64_t n, int64_t low, int64_t high)
+template <class T>
+block_sums<T> without_bias(raw_sums raw, int64_t bias, int64_t n, int64_t low, int64_t high)
 {
     return {raw.sum + bias * n, raw.squares + 2 * bias * raw.sum + bias * bias * n,
             raw.weighted + bias * (n * (n - 1) / 2), static_cast<T>(low + bias), static_cast<T>(high + bias)};
@@ -51,7 +54,8 @@ template <class T> block_sums<T> without_bias(raw_sums raw, int64_t bias, int64_
 
 /// The vectors of a block: whole ones from the pixels, and what is left in one that is filled up, with zero
 /// after the bias for sums and with the first pixel for extremes.
-template <class T> struct block_tail {
+template <class T>
+struct block_tail {
     static constexpr int lanes = static_cast<int>(sizeof(bits) / sizeof(T));
     T for_sums[lanes];
     T for_extremes[lanes];
@@ -101,7 +105,8 @@ struct byte_sums {
     }
 };
 
-template <class T> block_sums<T> byte_block(const uint8_t* p, int n)
+template <class T>
+block_sums<T> byte_block(const uint8_t* p, int n)
 {
     constexpr int lanes = static_cast<int>(sizeof(bits));
     constexpr int64_t bias = static_cast<T>(-1) < 0 ? -128 : 0;
@@ -122,7 +127,8 @@ template <class T> block_sums<T> byte_block(const uint8_t* p, int n)
         ++vectors;
     }
     const int64_t sum = sum_of<int64_t>(s.sum);
-    const int64_t weighted = lanes * (vectors * sum - sum_of<int64_t>(s.prefix)) + sum_of<int32_t>(s.weighted);
+    const int64_t weighted =
+        lanes * (vectors * sum - sum_of<int64_t>(s.prefix)) + sum_of<int32_t>(s.weighted);
     return without_bias<T>({sum, sum_of<int32_t>(s.squares), weighted}, bias, n, least_of<uint8_t>(s.least),
                            greatest_of<uint8_t>(s.greatest));
 }
@@ -156,7 +162,8 @@ struct short_sums {
     }
 };
 
-template <class T> block_sums<T> short_block(const uint8_t* p, int n)
+template <class T>
+block_sums<T> short_block(const uint8_t* p, int n)
 {
     constexpr int lanes = static_cast<int>(sizeof(bits) / 2);
     constexpr int64_t bias = static_cast<T>(-1) < 0 ? 0 : 32768;
@@ -168,8 +175,8 @@ template <class T> block_sums<T> short_block(const uint8_t* p, int n)
     const auto empty = [&](int64_t start, int64_t vectors) {
         const int64_t sum = sum_of<int32_t>(s.sum);
         raw.sum += sum;
-        raw.weighted += start * sum + lanes * (vectors * sum - sum_of<int32_t>(s.prefix)) +
-                        sum_of<int32_t>(s.weighted);
+        raw.weighted +=
+            start * sum + lanes * (vectors * sum - sum_of<int32_t>(s.prefix)) + sum_of<int32_t>(s.weighted);
         s.sum = s.prefix = s.weighted = zero_bits();
     };
     for (int start = 0; start < whole;) {
@@ -194,10 +201,11 @@ template <class T> block_sums<T> short_block(const uint8_t* p, int n)
 
 #endif // __SSE2__
 
-template <class T> block_sums<T> sum_block(const uint8_t* p, int n)
+template <class T>
+block_sums<T> sum_block(const uint8_t* p, int n)
 {
 #ifdef __SSE2__
-    if (n >= 16) {
+    if (n >= 32) {
         if constexpr (sizeof(T) == 1)
             return byte_block<T>(p, n);
         else
@@ -207,4 +215,4 @@ template <class T> block_sums<T> sum_block(const uint8_t* p, int n)
     return plain_block<T>(p, n);
 }
 
-} // namespace Qor::Luxar::ZELT::ZELT_LEVEL
+} // namespace Qor::Luxar::ZELT::ZELT_LEVEL::scalar_statistics

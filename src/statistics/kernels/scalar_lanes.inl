@@ -6,7 +6,7 @@
 
 #include "statistics/kernels/scalar_vectors.inl"
 
-namespace Qor::Luxar::ZELT::ZELT_LEVEL {
+namespace Qor::Luxar::ZELT::ZELT_LEVEL::scalar_statistics {
 
 inline constexpr int lane_count = 16;
 
@@ -16,43 +16,60 @@ struct row_lanes {
     double weighted[lane_count];
 };
 
-template <class T> struct value_range {
+template <class T>
+struct value_range {
     T minimum;
     T maximum;
 };
 
-inline double folded(const double (&lanes)[lane_count])
-{
-    double l[lane_count];
-    __builtin_memcpy(l, lanes, sizeof l);
-    for (int half = lane_count / 2; half > 0; half /= 2)
-        for (int i = 0; i < half; ++i) l[i] += l[i + half];
-    return l[0];
-}
-
-template <class V> V load_vector(const uint8_t* p)
+template <class V>
+V load_vector(const void* p)
 {
     V v;
     __builtin_memcpy(&v, p, sizeof v);
     return v;
 }
 
-template <class T> doubles load_doubles(const uint8_t* p)
+template <class V>
+void store_vector(void* p, V v)
+{
+    __builtin_memcpy(p, &v, sizeof v);
+}
+
+/// Folds a row's lanes by halves with an operation of two values.
+template <class T, class Operation>
+T folded(const T (&lanes)[lane_count], Operation operation)
+{
+    T l[lane_count / 2];
+    for (int i = 0; i < 8; ++i) l[i] = operation(lanes[i], lanes[i + 8]);
+    for (int i = 0; i < 4; ++i) l[i] = operation(l[i], l[i + 4]);
+    for (int i = 0; i < 2; ++i) l[i] = operation(l[i], l[i + 2]);
+    return operation(l[0], l[1]);
+}
+
+inline double sum_of_lanes(const double (&lanes)[lane_count])
+{
+    return folded(lanes, [](double a, double b) { return a + b; });
+}
+
+template <class T>
+doubles load_doubles(const uint8_t* p)
 {
     using part = typename vector_of<T>::part;
     if constexpr (sizeof(T) == sizeof(double)) {
         return load_vector<part>(p);
     } else if constexpr (static_cast<T>(-1) < 0) {
-        return __builtin_convertvector(load_vector<part>(p), doubles);
+        return widened(load_vector<part>(p));
     } else {
         // Unsigned: shifted into the signed range and back, both exact.
-        return __builtin_convertvector(load_vector<part>(p) ^ INT32_MIN, doubles) + 2147483648.0;
+        return widened(load_vector<part>(p) ^ INT32_MIN) + 2147483648.0;
     }
 }
 
 /// c + a * b, fused where that cannot be seen: the product of two floats, or of a float and a place below 2^29,
 /// is exact in double. 32-bit sums are used only where they are exact altogether.
-template <class T> doubles add_product(doubles a, doubles b, doubles c)
+template <class T>
+doubles add_product(doubles a, doubles b, doubles c)
 {
     if constexpr (sizeof(T) == sizeof(double))
         return a * b + c;
@@ -61,18 +78,23 @@ template <class T> doubles add_product(doubles a, doubles b, doubles c)
 }
 
 /// Adds n samples, of which the first belongs to lane 0 and lies at x. Extremes pass NaNs over.
-template <class T> value_range<T> add_lanes(const uint8_t* p, int n, double x, double step, row_lanes& lanes)
+template <class T>
+value_range<T> add_lanes(const uint8_t* p, int n, double x, double step, row_lanes& lanes)
 {
     using whole = typename vector_of<T>::whole;
     constexpr int parts = lane_count / vector_doubles;
     constexpr int element = static_cast<int>(sizeof(T));
     constexpr int wholes = lane_count * element / vector_bytes;
 
+    constexpr double ramp[lane_count] = {0, 1, 2, 3, 4, 5, 6, 7, 8, 9, 10, 11, 12, 13, 14, 15};
     doubles sum[parts], squares[parts], weighted[parts], place[parts];
-    __builtin_memcpy(sum, lanes.sum, sizeof sum);
-    __builtin_memcpy(squares, lanes.squares, sizeof squares);
-    __builtin_memcpy(weighted, lanes.weighted, sizeof weighted);
-    for (int i = 0; i < lane_count; ++i) place[i / vector_doubles][i % vector_doubles] = x + step * i;
+    for (int j = 0; j < parts; ++j) {
+        const int lane = j * vector_doubles;
+        sum[j] = load_vector<doubles>(lanes.sum + lane);
+        squares[j] = load_vector<doubles>(lanes.squares + lane);
+        weighted[j] = load_vector<doubles>(lanes.weighted + lane);
+        place[j] = load_vector<doubles>(ramp + lane) * step + x;
+    }
     const doubles advance = doubles{} + step * lane_count;
 
     const T first = load_element<T>(p, 0);
@@ -97,13 +119,17 @@ template <class T> value_range<T> add_lanes(const uint8_t* p, int n, double x, d
             greatest[j] = greater(v, greatest[j]);
         }
     }
-    __builtin_memcpy(lanes.sum, sum, sizeof sum);
-    __builtin_memcpy(lanes.squares, squares, sizeof squares);
-    __builtin_memcpy(lanes.weighted, weighted, sizeof weighted);
-
+    for (int j = 0; j < parts; ++j) {
+        const int lane = j * vector_doubles;
+        store_vector(lanes.sum + lane, sum[j]);
+        store_vector(lanes.squares + lane, squares[j]);
+        store_vector(lanes.weighted + lane, weighted[j]);
+    }
     T low[lane_count], high[lane_count];
-    __builtin_memcpy(low, least, sizeof low);
-    __builtin_memcpy(high, greatest, sizeof high);
+    for (int j = 0; j < wholes; ++j) {
+        store_vector(low + j * (vector_bytes / element), least[j]);
+        store_vector(high + j * (vector_bytes / element), greatest[j]);
+    }
     for (int i = even; i < n; ++i) {
         const T v = load_element<T>(p, i);
         const auto wide = static_cast<double>(v);
@@ -114,12 +140,8 @@ template <class T> value_range<T> add_lanes(const uint8_t* p, int n, double x, d
         low[lane] = v < low[lane] ? v : low[lane];
         high[lane] = v > high[lane] ? v : high[lane];
     }
-    value_range<T> range{low[0], high[0]};
-    for (int i = 1; i < lane_count; ++i) {
-        range.minimum = low[i] < range.minimum ? low[i] : range.minimum;
-        range.maximum = high[i] > range.maximum ? high[i] : range.maximum;
-    }
-    return range;
+    return {folded(low, [](T a, T b) { return a < b ? a : b; }),
+            folded(high, [](T a, T b) { return a > b ? a : b; })};
 }
 
-} // namespace Qor::Luxar::ZELT::ZELT_LEVEL
+} // namespace Qor::Luxar::ZELT::ZELT_LEVEL::scalar_statistics

@@ -9,9 +9,10 @@
 #include "statistics/kernels/scalar_lanes.inl"
 #include "statistics/kernels/statistics_table.h"
 
-namespace Qor::Luxar::ZELT::ZELT_LEVEL {
+namespace Qor::Luxar::ZELT::ZELT_LEVEL::scalar_statistics {
 
-template <class T> inline constexpr bool is_integer = static_cast<T>(0.5) == 0;
+template <class T>
+inline constexpr bool is_integer = static_cast<T>(0.5) == 0;
 
 /// Part of a row: n samples side by side, the first at (x, y).
 struct sample_block {
@@ -24,7 +25,8 @@ struct sample_block {
     int32_t x_of(int i) const { return static_cast<int32_t>(x + step * i); }
 };
 
-template <class T> struct extremes {
+template <class T>
+struct extremes {
     value_range<T> range;
     uint64_t minimum_count, maximum_count;
     coordinate<int32_t> minimum_at, maximum_at;
@@ -32,7 +34,8 @@ template <class T> struct extremes {
 
 /// The rule a pixel at a time. It is written with negations for NaN: one replaces the minimum and is replaced by
 /// the next pixel; to the maximum it counts as equal.
-template <class T> void compare_one_by_one(sample_block b, extremes<T>& e)
+template <class T>
+void compare_one_by_one(sample_block b, extremes<T>& e)
 {
     const auto y = static_cast<int32_t>(b.y);
     for (int i = 0; i < b.n; ++i) {
@@ -54,22 +57,28 @@ template <class T> void compare_one_by_one(sample_block b, extremes<T>& e)
     }
 }
 
-template <size_t Bytes> struct counter;
-template <> struct counter<1> {
+template <size_t Bytes>
+struct counter;
+template <>
+struct counter<1> {
     using type = uint8_t;
 };
-template <> struct counter<2> {
+template <>
+struct counter<2> {
     using type = uint16_t;
 };
-template <> struct counter<4> {
+template <>
+struct counter<4> {
     using type = uint32_t;
 };
-template <> struct counter<8> {
+template <>
+struct counter<8> {
     using type = uint64_t;
 };
 
 /// How often a value stands in a block. Short runs, so that counters as narrow as the pixels suffice.
-template <class T> uint64_t count_of(const uint8_t* p, int n, T value)
+template <class T>
+uint64_t count_of(const uint8_t* p, int n, T value)
 {
     using count_type = typename counter<sizeof(T)>::type;
     constexpr int run = 128;
@@ -85,24 +94,28 @@ template <class T> uint64_t count_of(const uint8_t* p, int n, T value)
     return total;
 }
 
-/// The first place of a value that is in the block.
-template <class T> int find_first(const uint8_t* p, int n, T value)
+/// The first place of a value that is in the block. The least place of each run needs no branch on a pixel.
+template <class T>
+int find_first(const uint8_t* p, int n, T value)
 {
+    using place_type = typename counter<sizeof(T)>::type;
     constexpr int run = 64;
-    int start = 0;
-    while (n - start > run) {
+    for (int start = 0; start < n; start += run) {
+        const int length = n - start < run ? n - start : run;
         const uint8_t* const q = p + static_cast<ptrdiff_t>(start) * static_cast<ptrdiff_t>(sizeof(T));
-        bool found = false;
-        for (int i = 0; i < run; ++i) found |= load_element<T>(q, i) == value;
-        if (found) break;
-        start += run;
+        place_type place = run;
+        for (int i = 0; i < length; ++i) {
+            const auto here = static_cast<place_type>(load_element<T>(q, i) == value ? i : run);
+            place = here < place ? here : place;
+        }
+        if (place < run) return start + static_cast<int>(place);
     }
-    while (load_element<T>(p, start) != value) ++start;
-    return start;
+    return n - 1;
 }
 
 /// The same as pixel by pixel for a block without NaN: only a block that reaches an extreme is searched for it.
-template <class T> void compare_block(sample_block b, value_range<T> range, extremes<T>& e)
+template <class T>
+void compare_block(sample_block b, value_range<T> range, extremes<T>& e)
 {
     const auto y = static_cast<int32_t>(b.y);
     if (range.minimum <= e.range.minimum) {
@@ -127,7 +140,8 @@ template <class T> void compare_block(sample_block b, value_range<T> range, extr
 
 /// Copies samples side by side. A pixel of an odd depth is the one or three bytes of that depth, the lowest
 /// first, widened to its element: nothing beside it is read.
-template <class T> void gather(const uint8_t* p, int64_t stride, int n, int32_t pixel_bytes, T* to)
+template <class T>
+void gather(const uint8_t* p, int64_t stride, int n, int32_t pixel_bytes, T* to)
 {
     if (pixel_bytes == static_cast<int32_t>(sizeof(T))) {
         for (int i = 0; i < n; ++i) to[i] = load_element<T>(p + stride * i, 0);
@@ -154,7 +168,8 @@ struct four_sums {
     double moment_y;
 };
 
-template <class T> void add_one_by_one(sample_block b, four_sums& s)
+template <class T>
+void add_one_by_one(sample_block b, four_sums& s)
 {
     const auto y = static_cast<double>(b.y);
     for (int i = 0; i < b.n; ++i) {
@@ -167,7 +182,8 @@ template <class T> void add_one_by_one(sample_block b, four_sums& s)
 }
 
 /// Adds what the block as a whole has where no sum can pass 2^53 on the way, else pixel by pixel.
-template <class T> void add_integers(sample_block b, block_sums<T> block, four_sums& s)
+template <class T>
+void add_integers(sample_block b, block_sums<T> block, four_sums& s)
 {
     const double low = __builtin_fabs(static_cast<double>(block.minimum));
     const double high = __builtin_fabs(static_cast<double>(block.maximum));
@@ -190,22 +206,26 @@ template <class T> void add_integers(sample_block b, block_sums<T> block, four_s
 }
 
 /// 32-bit integers: the lanes hold whole numbers, exact wherever add_integers uses them.
-template <class T> block_sums<T> sum_exact_lanes(sample_block b)
+template <class T>
+block_sums<T> sum_exact_lanes(sample_block b)
 {
     row_lanes lanes{};
     const value_range<T> range = add_lanes<T>(b.p, b.n, 0.0, 1.0, lanes);
     constexpr double limit = 9007199254740992.0;
-    const double sum = folded(lanes.sum), squares = folded(lanes.squares), weighted = folded(lanes.weighted);
+    const double sum = sum_of_lanes(lanes.sum), squares = sum_of_lanes(lanes.squares),
+                 weighted = sum_of_lanes(lanes.weighted);
     const bool usable = __builtin_fabs(sum) < limit && squares < limit && __builtin_fabs(weighted) < limit;
     if (!usable) return {0, 0, 0, range.minimum, range.maximum};
     return {static_cast<int64_t>(sum), static_cast<int64_t>(squares), static_cast<int64_t>(weighted),
             range.minimum, range.maximum};
 }
 
-template <class T> struct scanner {
+template <class T>
+struct scanner {
     extremes<T> e;
     four_sums s;
     row_lanes lanes; ///< of the row at hand, float and double only
+    double row_sum;
 
     void add(sample_block b)
     {
@@ -213,8 +233,8 @@ template <class T> struct scanner {
             const auto x = static_cast<double>(b.x);
             const value_range<T> range = add_lanes<T>(b.p, b.n, x, static_cast<double>(b.step), lanes);
             // A NaN in the block leaves one in the sum. So do infinities of both signs, which does no harm.
-            const double sum = folded(lanes.sum);
-            const bool comparable = sum == sum && e.range.minimum == e.range.minimum &&
+            row_sum = sum_of_lanes(lanes.sum);
+            const bool comparable = row_sum == row_sum && e.range.minimum == e.range.minimum &&
                                     e.range.maximum == e.range.maximum;
             if (comparable)
                 compare_block<T>(b, range, e);
@@ -233,11 +253,10 @@ template <class T> struct scanner {
     void end_row(int64_t y)
     {
         if constexpr (!is_integer<T>) {
-            const double sum = folded(lanes.sum);
-            s.sum += sum;
-            s.squares += folded(lanes.squares);
-            s.moment_x += folded(lanes.weighted);
-            s.moment_y += static_cast<double>(y) * sum;
+            s.sum += row_sum;
+            s.squares += sum_of_lanes(lanes.squares);
+            s.moment_x += sum_of_lanes(lanes.weighted);
+            s.moment_y += static_cast<double>(y) * row_sum;
             lanes = {};
         }
     }
@@ -245,13 +264,14 @@ template <class T> struct scanner {
 
 /// The grid has at least one pixel. The extremes start there with a count of 1, and the scan counts it once more.
 /// Every block but the last of a row is a whole number of lanes long.
-template <class T> void scan(const sample_grid& grid, scan_result& result)
+template <class T>
+void scan(const sample_grid& grid, scan_result& result)
 {
     const sample_grid g = grid;
     const int64_t columns = (static_cast<int64_t>(g.width) + g.step - 1) / g.step;
     const int64_t stride = g.x_stride * g.step;
-    const bool side_by_side = stride == static_cast<int64_t>(sizeof(T)) &&
-                              g.pixel_bytes == static_cast<int32_t>(sizeof(T));
+    const bool side_by_side =
+        stride == static_cast<int64_t>(sizeof(T)) && g.pixel_bytes == static_cast<int32_t>(sizeof(T));
     constexpr int gathered = 1024;
     T buffer[gathered];
     const int length = side_by_side ? max_block / static_cast<int>(sizeof(T)) : gathered;
@@ -274,10 +294,18 @@ template <class T> void scan(const sample_grid& grid, scan_result& result)
         scanner.end_row(y);
     }
     const extremes<T>& e = scanner.e;
-    result = {static_cast<double>(e.range.minimum), static_cast<double>(e.range.maximum),
-              e.minimum_count,  e.maximum_count,  e.minimum_at.x,     e.minimum_at.y,
-              e.maximum_at.x,   e.maximum_at.y,   scanner.s.sum,      scanner.s.squares,
-              scanner.s.moment_x, scanner.s.moment_y};
+    result = {static_cast<double>(e.range.minimum),
+              static_cast<double>(e.range.maximum),
+              e.minimum_count,
+              e.maximum_count,
+              e.minimum_at.x,
+              e.minimum_at.y,
+              e.maximum_at.x,
+              e.maximum_at.y,
+              scanner.s.sum,
+              scanner.s.squares,
+              scanner.s.moment_x,
+              scanner.s.moment_y};
 }
 
-} // namespace Qor::Luxar::ZELT::ZELT_LEVEL
+} // namespace Qor::Luxar::ZELT::ZELT_LEVEL::scalar_statistics

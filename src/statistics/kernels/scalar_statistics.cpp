@@ -40,14 +40,21 @@ scan_function scan_of(pixel_type element)
 sample_grid grid_of(const image_layout& image, const void* data, const rectangle& area, int32_t step,
                     const value_format& format)
 {
-    const int64_t corner = image.offset + int64_t{area.top} * image.y_stride + int64_t{area.left} * image.x_stride;
-    return {static_cast<const uint8_t*>(data) + corner, area.right - area.left, area.bottom - area.top,
-            image.x_stride, image.y_stride, step, format.pixel_bytes};
+    const int64_t corner =
+        image.offset + int64_t{area.top} * image.y_stride + int64_t{area.left} * image.x_stride;
+    return {static_cast<const uint8_t*>(data) + corner,
+            area.right - area.left,
+            area.bottom - area.top,
+            image.x_stride,
+            image.y_stride,
+            step,
+            format.pixel_bytes};
 }
 
 /// Extremes start at the pixel in the area's corner, also where there is nothing to scan. That pixel may lie outside
 /// the image: the nearest one stands for it.
-scan_result start_only(const image_layout& image, const void* data, rectangle area, const value_format& format)
+scan_result start_only(const image_layout& image, const void* data, rectangle area,
+                       const value_format& format)
 {
     scan_result result{};
     result.minimum = result.maximum = std::numeric_limits<double>::quiet_NaN();
@@ -69,15 +76,17 @@ scan_result start_only(const image_layout& image, const void* data, rectangle ar
 std::optional<value_format> find_value_format(PixmatEncoding encoding, int32_t bits)
 {
     const int32_t bytes = (bits + 7) / 8;
-    if (encoding == PixmatEncoding_Float && bits == 32) return value_format{pixel_type::float_32, bytes, 0, 1};
-    if (encoding == PixmatEncoding_Float && bits == 64) return value_format{pixel_type::float_64, bytes, 0, 1};
+    if (encoding == PixmatEncoding_Float && bits == 32)
+        return value_format{pixel_type::float_32, bytes, 0, 1};
+    if (encoding == PixmatEncoding_Float && bits == 64)
+        return value_format{pixel_type::float_64, bytes, 0, 1};
     if (bits < 1 || bits > 32) return {};
     const auto pick = [&](pixel_type narrow, pixel_type middle, pixel_type wide) {
         return bits == 8 ? narrow : bits <= 16 ? middle : wide;
     };
     if (encoding == PixmatEncoding_Unsigned)
-        return value_format{pick(pixel_type::unsigned_8, pixel_type::unsigned_16, pixel_type::unsigned_32), bytes,
-                            0, all_ones(bits)};
+        return value_format{pick(pixel_type::unsigned_8, pixel_type::unsigned_16, pixel_type::unsigned_32),
+                            bytes, 0, all_ones(bits)};
     if (encoding == PixmatEncoding_Signed)
         return value_format{pick(pixel_type::signed_8, pixel_type::signed_16, pixel_type::signed_32), bytes,
                             -half_range(bits), half_range(bits) - 1};

@@ -8,9 +8,10 @@
 #include <immintrin.h>
 #endif
 
-namespace Qor::Luxar::ZELT::ZELT_LEVEL {
+namespace Qor::Luxar::ZELT::ZELT_LEVEL::scalar_statistics {
 
-template <class T> T load_element(const uint8_t* p, int64_t i)
+template <class T>
+T load_element(const uint8_t* p, int64_t i)
 {
     T value;
     __builtin_memcpy(&value, p + i * static_cast<int64_t>(sizeof(T)), sizeof value);
@@ -81,7 +82,8 @@ inline bits sad(bits a, bits b) { return _mm_sad_epu8(a, b); }
 #endif
 
 /// The sum of all 32- or 64-bit lanes.
-template <class Lane> int64_t sum_of(bits a)
+template <class Lane>
+int64_t sum_of(bits a)
 {
     Lane lanes[sizeof(bits) / sizeof(Lane)];
     store_bits(lanes, a);
@@ -91,7 +93,8 @@ template <class Lane> int64_t sum_of(bits a)
 }
 
 /// The least and the greatest of all lanes.
-template <class Lane> Lane least_of(bits a)
+template <class Lane>
+Lane least_of(bits a)
 {
     Lane lanes[sizeof(bits) / sizeof(Lane)];
     store_bits(lanes, a);
@@ -99,7 +102,8 @@ template <class Lane> Lane least_of(bits a)
     for (const Lane l : lanes) least = l < least ? l : least;
     return least;
 }
-template <class Lane> Lane greatest_of(bits a)
+template <class Lane>
+Lane greatest_of(bits a)
 {
     Lane lanes[sizeof(bits) / sizeof(Lane)];
     store_bits(lanes, a);
@@ -123,27 +127,40 @@ inline constexpr int vector_doubles = vector_bytes / 8;
 typedef double doubles __attribute__((vector_size(vector_bytes)));
 typedef float floats __attribute__((vector_size(vector_bytes)));
 
-template <class T> struct vector_of;
-template <> struct vector_of<float> {
+template <class T>
+struct vector_of;
+template <>
+struct vector_of<float> {
     typedef floats whole;
     typedef float part __attribute__((vector_size(vector_bytes / 2))); ///< as many as there are doubles
 };
-template <> struct vector_of<int32_t> {
+template <>
+struct vector_of<int32_t> {
     typedef int32_t whole __attribute__((vector_size(vector_bytes)));
     typedef int32_t part __attribute__((vector_size(vector_bytes / 2)));
 };
-template <> struct vector_of<uint32_t> {
+template <>
+struct vector_of<uint32_t> {
     typedef uint32_t whole __attribute__((vector_size(vector_bytes)));
     typedef int32_t part __attribute__((vector_size(vector_bytes / 2)));
 };
-template <> struct vector_of<double> {
+template <>
+struct vector_of<double> {
     typedef doubles whole;
     typedef doubles part;
 };
 
 /// The lesser and the greater of two lanes; with a NaN in a lane the second argument wins.
-template <class V> V lesser(V a, V b) { return a < b ? a : b; }
-template <class V> V greater(V a, V b) { return a > b ? a : b; }
+template <class V>
+V lesser(V a, V b)
+{
+    return a < b ? a : b;
+}
+template <class V>
+V greater(V a, V b)
+{
+    return a > b ? a : b;
+}
 #if defined(__AVX512F__)
 inline floats lesser(floats a, floats b) { return _mm512_maskz_min_ps(static_cast<__mmask16>(-1), a, b); }
 inline floats greater(floats a, floats b) { return _mm512_maskz_max_ps(static_cast<__mmask16>(-1), a, b); }
@@ -167,4 +184,14 @@ inline doubles greater(doubles a, doubles b) { return _mm_max_pd(a, b); }
 inline doubles add_exact_product(doubles a, doubles b, doubles c) { return a * b + c; }
 #endif
 
-} // namespace Qor::Luxar::ZELT::ZELT_LEVEL
+/// As many 32-bit elements as there are doubles, each turned into one exactly.
+template <class Part>
+doubles widened(Part a)
+{
+    return __builtin_convertvector(a, doubles);
+}
+#if defined(__AVX512F__)
+inline doubles widened(vector_of<float>::part a) { return _mm512_maskz_cvtps_pd(0xff, a); }
+#endif
+
+} // namespace Qor::Luxar::ZELT::ZELT_LEVEL::scalar_statistics
