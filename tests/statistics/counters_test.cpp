@@ -24,8 +24,10 @@ TEST(Counters, CountLikeADefinitionPixelByPixel)
     for_each_case<uint8_t, uint16_t, uint32_t, int8_t, int16_t, int32_t, float, double>(
         values::special, []<class T>(const test_case<T>& c) {
             const memory_2d src = c.input.view();
-            for (const double value : {0.0, 7.0, -1.0, 255.0, std::numeric_limits<double>::quiet_NaN()}) {
-                int64_t less = 0, equal = 0, more = 0, inside = 0;
+            using limits = std::numeric_limits<double>;
+            for (const double value : {0.0, 7.5, -1.0, -128.5, 255.0, 4294967295.0, 1e300, limits::infinity(),
+                                       -limits::infinity(), limits::quiet_NaN()}) {
+                int64_t less = 0, equal = 0, more = 0, inside = 0, up = 0;
                 each(c.input, [&](int, int, double v) {
                     if (!(v >= value))
                         ++less;
@@ -33,25 +35,40 @@ TEST(Counters, CountLikeADefinitionPixelByPixel)
                         ++more;
                     else
                         ++equal;
-                    inside += v >= value && !(v > 100.0) ? 1 : 0;
+                    inside += v >= value && !(v > 100.9) ? 1 : 0;
+                    up += v >= -2.5 && !(v > value) ? 1 : 0;
                 });
                 const comparison found = compare_pixels(src, value);
                 EXPECT_EQ(found.less, less);
                 EXPECT_EQ(found.equal, equal);
                 EXPECT_EQ(found.more, more);
-                EXPECT_EQ(count_range(src, value, 100.0), inside);
+                EXPECT_EQ(count_range(src, value, 100.9), inside) << value;
+                EXPECT_EQ(count_range(src, -2.5, value), up) << value;
             }
         });
+}
+
+TEST(Counters, DoNotWrapInLongRows)
+{
+    test_image<uint8_t> image({70000, 2});
+    image.fill([](int, int) { return uint8_t{9}; });
+    EXPECT_EQ(compare_pixels(image.view(), 9).less, 0);
+    EXPECT_EQ(compare_pixels(image.view(), 10).less, 140000);
+    EXPECT_EQ(count_range(image.view(), 9, 9), 140000);
 }
 
 TEST(Counters, BoxesAndMomentsLikeTheDefinition)
 {
     for_each_case<uint8_t, int16_t, uint32_t, int32_t, float, double>(
         values::plain, []<class T>(const test_case<T>& c) {
-            const memory_2d src = c.input.view();
+            // Mostly zeros, so that edges of the box lie anywhere.
+            test_image<T> image = c.input;
+            generator random(image.width() + 100 * image.height());
+            image.fill([&](int x, int y) { return random() % 30 == 0 ? c.input.at(x, y) : T{0}; });
+            const memory_2d src = image.view();
             rectangle box{src.width, src.height, 0, 0};
             double sum21 = 0, sum03 = 0;
-            each(c.input, [&](int x, int y, double v) {
+            each(image, [&](int x, int y, double v) {
                 sum21 += static_cast<double>(x) * x * std::pow(y, 1) * v;
                 sum03 += std::pow(x, 0) * (static_cast<double>(y) * y * y) * v;
                 if (v == 0 || std::isnan(v)) return;

@@ -6,6 +6,7 @@
 
 #include <algorithm>
 #include <cmath>
+#include <limits>
 #include <type_traits>
 #include <vector>
 
@@ -14,35 +15,79 @@ namespace {
 
 using namespace ZELT_LEVEL;
 
+/// Integer pixels between two limits that are whole numbers or infinite, both included.
+template <class T, class Rows>
+int64_t count_between(Rows src, double low, double high)
+{
+    using limits = std::numeric_limits<T>;
+    const double first = std::max(low, static_cast<double>(limits::min()));
+    const double last = std::min(high, static_cast<double>(limits::max()));
+    if (!(first <= last)) return 0;
+    using bits = std::make_unsigned_t<T>;
+    const auto base = static_cast<bits>(static_cast<T>(first));
+    const auto span = static_cast<bits>(static_cast<bits>(static_cast<T>(last)) - base);
+    int64_t total = 0;
+    for (int32_t y = 0; y < src.height; ++y) {
+        const auto row = src[y];
+        // Short runs, so that counters as narrow as the pixels suffice.
+        for (int32_t start = 0; start < src.width;) {
+            const int32_t end = src.width - start < 128 ? src.width : start + 128;
+            bits count = 0;
+            for (int32_t x = start; x < end; ++x) {
+                const auto above = static_cast<bits>(static_cast<bits>(static_cast<T>(row[x])) - base);
+                count = static_cast<bits>(count + (above <= span ? 1 : 0));
+            }
+            total += count;
+            start = end;
+        }
+    }
+    return total;
+}
+
+constexpr double infinite = std::numeric_limits<double>::infinity();
+
 template <class T, class Rows>
 comparison compare_rows(Rows src, double value)
 {
-    int64_t not_less = 0;
-    int64_t more = 0;
-    for (int32_t y = 0; y < src.height; ++y) {
-        const auto row = src[y];
-        for (int32_t x = 0; x < src.width; ++x) {
-            const auto v = static_cast<double>(static_cast<T>(row[x]));
-            not_less += v >= value ? 1 : 0;
-            more += v > value ? 1 : 0;
-        }
-    }
     const int64_t all = int64_t{src.width} * src.height;
-    return {all - not_less, not_less - more, more};
+    if (std::isnan(value)) return {all, 0, 0};
+    int64_t more = 0;
+    if constexpr (std::is_integral_v<T>) {
+        // A whole number is below a value when it is at most the last whole number that is.
+        const int64_t less = count_between<T>(src, -infinite, std::ceil(value) - 1);
+        more = count_between<T>(src, std::floor(value) + 1, infinite);
+        return {less, all - less - more, more};
+    } else {
+        int64_t not_less = 0;
+        for (int32_t y = 0; y < src.height; ++y) {
+            const auto row = src[y];
+            for (int32_t x = 0; x < src.width; ++x) {
+                const auto v = static_cast<double>(static_cast<T>(row[x]));
+                not_less += v >= value ? 1 : 0;
+                more += v > value ? 1 : 0;
+            }
+        }
+        return {all - not_less, not_less - more, more};
+    }
 }
 
 template <class T, class Rows>
 int64_t count_rows(Rows src, double low, double high)
 {
-    int64_t n = 0;
-    for (int32_t y = 0; y < src.height; ++y) {
-        const auto row = src[y];
-        for (int32_t x = 0; x < src.width; ++x) {
-            const auto v = static_cast<double>(static_cast<T>(row[x]));
-            n += v >= low && !(v > high) ? 1 : 0;
+    if constexpr (std::is_integral_v<T>) {
+        if (std::isnan(low)) return 0;
+        return count_between<T>(src, std::ceil(low), std::isnan(high) ? infinite : std::floor(high));
+    } else {
+        int64_t n = 0;
+        for (int32_t y = 0; y < src.height; ++y) {
+            const auto row = src[y];
+            for (int32_t x = 0; x < src.width; ++x) {
+                const auto v = static_cast<double>(static_cast<T>(row[x]));
+                n += v >= low && !(v > high) ? 1 : 0;
+            }
         }
+        return n;
     }
-    return n;
 }
 
 template <class T, class Rows>
@@ -75,17 +120,25 @@ double power(double base, int32_t exponent)
     return exponent == 2 ? base * base : Sleef_cinz_powd1_u10purec(base, exponent);
 }
 
+// The powers come in tables: a call between the rows would keep the sum in memory.
 template <class T, class Rows>
-double moment_of_rows(Rows src, const double* x_powers, int32_t j)
+double moment_of_rows(Rows src, const double* x_powers, const double* y_powers)
 {
     double sum = 0;
     for (int32_t y = 0; y < src.height; ++y) {
         const auto row = src[y];
-        const double y_power = power(y, j);
+        const double y_power = y_powers[y];
         for (int32_t x = 0; x < src.width; ++x)
             sum += x_powers[x] * y_power * static_cast<double>(static_cast<T>(row[x]));
     }
     return sum;
+}
+
+std::vector<double> powers(int32_t count, int32_t exponent)
+{
+    std::vector<double> table(static_cast<size_t>(std::max(count, 0)));
+    for (size_t i = 0; i < table.size(); ++i) table[i] = power(static_cast<double>(i), exponent);
+    return table;
 }
 
 /// True when the test holds for a pixel.
@@ -95,8 +148,9 @@ bool any_pixel(const memory_2d& src, Test test)
     return with_rows<T>(src, [test](auto rows) {
         for (int32_t y = 0; y < rows.height; ++y) {
             const auto row = rows[y];
-            for (int32_t x = 0; x < rows.width; ++x)
-                if (test(static_cast<T>(row[x]))) return true;
+            uint32_t found = 0; // a row is searched in vectors, without a way out
+            for (int32_t x = 0; x < rows.width; ++x) found |= test(static_cast<T>(row[x])) ? 1 : 0;
+            if (found != 0) return true;
         }
         return false;
     });
@@ -162,9 +216,10 @@ double moment(const memory_2d& src, int32_t i, int32_t j)
 {
     double sum = 0;
     switch_scalar(src.type, "Moment: unsupported pixel type", [&]<class T>(pixel<T>) {
-        std::vector<double> x_powers(static_cast<size_t>(std::max(src.width, 0)));
-        for (size_t x = 0; x < x_powers.size(); ++x) x_powers[x] = power(static_cast<double>(x), i);
-        sum = with_rows<T>(src, [&](auto rows) { return moment_of_rows<T>(rows, x_powers.data(), j); });
+        const auto x_powers = powers(src.width, i);
+        const auto y_powers = powers(src.height, j);
+        sum = with_rows<T>(
+            src, [&](auto rows) { return moment_of_rows<T>(rows, x_powers.data(), y_powers.data()); });
     });
     return sum;
 }
@@ -173,14 +228,14 @@ bool has_nan(const memory_2d& src)
 {
     // A complex pixel with one NaN part does not count.
     return any_real_or_complex(src, "IsNaN: unsupported pixel type", [](auto real, auto imaginary) {
-        return std::isnan(real) && std::isnan(imaginary);
+        return (real != real) & (imaginary != imaginary);
     });
 }
 
 bool is_finite(const memory_2d& src)
 {
     return !any_real_or_complex(src, "IsFinite: unsupported pixel type", [](auto real, auto imaginary) {
-        return !std::isfinite(real) || !std::isfinite(imaginary);
+        return (real - real != 0) | (imaginary - imaginary != 0);
     });
 }
 
