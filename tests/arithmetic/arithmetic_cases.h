@@ -30,6 +30,12 @@ inline std::string name(storage t)
     return names[static_cast<int>(t)];
 }
 
+template <class T>
+Arithmetic::image image_of(const test_image<T>& i)
+{
+    return {i.layout(), static_cast<uint8_t*>(i.data())};
+}
+
 /// A pixel or number: every real type fits into one of the two.
 struct plain_value {
     storage type;

@@ -155,6 +155,11 @@ TEST(Binary, NumbersFollowTheDefinition)
         for (const storage to : real_types) {
             const bool changes_type = Arithmetic::is_unsigned(t) || Arithmetic::is_float(t);
             if (t != to && !changes_type) continue;
+            const auto l = static_cast<memory_layout>(++turn % memory_layout_count);
+            const size s{turn % 4 == 0 ? 300 : 33, 2};
+            real_image packed(t, s, memory_layout::packed), apart(t, s, l);
+            packed.fill(static_cast<uint64_t>(turn)), apart.fill(static_cast<uint64_t>(turn));
+            packed.replace_zeros(), apart.replace_zeros();
             for (const storage of_number : real_types)
                 for (const plain_value& n : numbers(of_number))
                     step(name(t) + " and " + name(of_number) + " to " + name(to), [&] {
@@ -162,13 +167,9 @@ TEST(Binary, NumbersFollowTheDefinition)
                         for_each_method([&](method m, int rounding) {
                             if (m == method::divide && is_integer(t) && is_integer(of_number) && n.whole == 0)
                                 return;
-                            const auto l = static_cast<memory_layout>(++turn % 3 * 3 % memory_layout_count);
-                            const size s{turn % 5 == 0 ? 300 : 33, 2};
-                            real_image a(t, s, l);
-                            a.fill(static_cast<uint64_t>(turn));
-                            if (m == method::reverse_divide && is_integer(of_number)) a.replace_zeros();
+                            const auto& a = ++turn % 2 ? packed : apart;
                             for_each_level([&](level) {
-                                real_image dst(to, s, turn % 2 ? memory_layout::packed : l);
+                                const real_image dst(to, s, turn % 2 ? memory_layout::packed : l);
                                 ASSERT_EQ(Arithmetic::check_number_form(a.view(), dst.view()), outcome::done);
                                 ASSERT_EQ(
                                     Arithmetic::combine(m, rounding, a.view(), number_of(n), dst.view()),
@@ -200,11 +201,9 @@ TEST(Binary, TheOneQuotientWithoutPlaceWraps)
     test_image<int32_t> a({300, 1}), b({300, 1}), dst({300, 1});
     a.fill([](int x, int) { return x % 2 ? std::numeric_limits<int32_t>::min() : x; });
     b.fill([](int, int) { return -1; });
-    const auto view = [](const test_image<int32_t>& i) {
-        return Arithmetic::image{i.layout(), static_cast<uint8_t*>(i.data())};
-    };
     for_each_level([&](level) {
-        ASSERT_EQ(Arithmetic::combine(method::divide, wrap, view(a), view(b), view(dst)), outcome::done);
+        ASSERT_EQ(Arithmetic::combine(method::divide, wrap, image_of(a), image_of(b), image_of(dst)),
+                  outcome::done);
         expect_equal(dst, [](int x, int) { return x % 2 ? std::numeric_limits<int32_t>::min() : -x; });
     });
 }

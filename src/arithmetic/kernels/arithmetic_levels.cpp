@@ -76,14 +76,12 @@ template <class Part>
 constexpr void fill_complex(arithmetic_table& t)
 {
     using P = complex_pixel<Part>;
-    const auto fill = [&](operation op, form f, Arithmetic::direct_function function) {
-        t.direct[index(op)][index(f)][index_of<P>()][wrap] = function;
-        t.direct[index(op)][index(f)][index_of<P>()][saturate] = function;
+    const auto fill = [&](operation op, Arithmetic::direct_function function) {
+        t.direct[index(op)][index(form::images)][index_of<P>()][wrap] = function;
+        t.direct[index(op)][index(form::images)][index_of<P>()][saturate] = function;
     };
-    fill(operation::add, form::images, direct_parts<operation::add, Part>);
-    fill(operation::subtract, form::images, direct_parts<operation::subtract, Part>);
-    fill(operation::multiply, form::images, direct<operation::multiply, form::images, rounding::wrap, P>);
-    fill(operation::divide, form::images, direct<operation::divide, form::images, rounding::wrap, P>);
+    fill(operation::add, direct_parts<operation::add, Part>);
+    fill(operation::subtract, direct_parts<operation::subtract, Part>);
 }
 
 constexpr arithmetic_table make_table()

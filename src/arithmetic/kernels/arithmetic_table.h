@@ -39,7 +39,8 @@ struct range {
 /// Pixels in a block; each of its buffers has room for so many of the widest computing type.
 inline constexpr int32_t block_pixels = 256;
 
-/// Widens pixels of one storage, any stride, to a computing type.
+/// Widens pixels of one storage, any stride, to a computing type. Complex numbers: real parts, then, block_pixels
+/// behind, imaginary ones.
 using load_function = void (*)(const uint8_t* from, int64_t stride, int32_t count, void* to);
 /// result[i] = a[i] op b[i] in a computing type.
 using apply_function = void (*)(const void* a, const void* b, int32_t count, void* result);

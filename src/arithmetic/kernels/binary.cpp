@@ -260,14 +260,16 @@ outcome combine(method m, int32_t given_rounding, const image& a, const image& b
     const range limits = range_of(dst.layout);
     if (chosen.reversed) std::swap(first, second);
 
-    if (first.type == to && second.type == to && first.adjacent() && second.adjacent() && out.adjacent()) {
+    const direct_function direct =
+        table.direct[index(chosen.op)][index(form::images)][index(to)][index(mode)];
+    if (first.type == to && second.type == to && first.adjacent() && second.adjacent() && out.adjacent() &&
+        (chosen.assigns || direct)) {
         const bool in_one_row = is_packed(out, extent) && is_packed(second, extent) &&
                                 (chosen.assigns || is_packed(first, extent));
         if (chosen.assigns)
             copy_rows(second, out, extent, in_one_row);
         else
-            run_direct(table.direct[index(chosen.op)][index(form::images)][index(to)][index(mode)], first,
-                       second, out, limits, extent, in_one_row);
+            run_direct(direct, first, second, out, limits, extent, in_one_row);
         return outcome::done;
     }
     const auto load = [&](const plane& p) { return source{p, table.load[index(c)][index(p.type)]}; };
@@ -330,23 +332,23 @@ bool as_pixel(const number& b, storage type, operation op, rounding mode, void* 
 /// The number throughout a block, in the computing type.
 void fill_block(const number& b, computing c, block& to)
 {
-    const auto fill = [&]<class W>(W value) {
-        for (int32_t i = 0; i < block_pixels; ++i)
-            std::memcpy(to.bytes + i * sizeof value, &value, sizeof value);
-    };
-    struct pair_32 {
-        float real, imaginary;
-    };
-    struct pair_64 {
-        double real, imaginary;
+    const auto fill = [&]<class W>(W value, int32_t first = 0) {
+        for (int32_t i = first; i < first + block_pixels; ++i)
+            std::memcpy(to.bytes + static_cast<size_t>(i) * sizeof value, &value, sizeof value);
     };
     switch (c) {
     case computing::u32:
     case computing::i32: fill(static_cast<uint32_t>(static_cast<int64_t>(b.real))); break;
     case computing::f32: fill(static_cast<float>(b.real)); break;
     case computing::f64: fill(b.real); break;
-    case computing::c32: fill(pair_32{static_cast<float>(b.real), static_cast<float>(b.imaginary)}); break;
-    case computing::c64: fill(pair_64{b.real, b.imaginary}); break;
+    case computing::c32:
+        fill(static_cast<float>(b.real));
+        fill(static_cast<float>(b.imaginary), block_pixels);
+        break;
+    case computing::c64:
+        fill(b.real);
+        fill(b.imaginary, block_pixels);
+        break;
     }
 }
 

@@ -17,24 +17,42 @@ void with_row(const uint8_t* first, int64_t stride, Body body)
         body(strided_row<T>{at, stride});
 }
 
-template <class W, class S>
-W widened(S s)
-{
-    if constexpr (is_pair<S>)
-        return {static_cast<decltype(W::real)>(s.real), static_cast<decltype(W::real)>(s.imaginary)};
-    else if constexpr (is_pair<W>)
-        return {static_cast<decltype(W::real)>(s), 0};
-    else
-        return static_cast<W>(s);
-}
+/// Complex numbers in a block: all real parts, then all imaginary ones. Apart, since GCC 12 would fuse the products
+/// and sums of neighbours (-ffp-contract=off or not) where the processor can, and change their bits.
+template <class W>
+struct parts_of {
+    using part = decltype(W::real);
+    part* real;
+    part* imaginary;
+
+    explicit parts_of(void* block)
+        : real(static_cast<part*>(block)), imaginary(real + Arithmetic::block_pixels)
+    {
+    }
+    explicit parts_of(const void* block) : parts_of(const_cast<void*>(block)) {}
+};
 
 template <class W, class S>
 void load(const uint8_t* from, int64_t stride, int32_t count, void* to)
 {
-    auto* const out = static_cast<W*>(to);
     with_row<S>(from, stride, [=](auto row) {
-        each(
-            count, [](S s) { return widened<W>(s); }, out, row);
+        if constexpr (is_pair<W>) {
+            using part = decltype(W::real);
+            const parts_of<W> out(to);
+            for (int32_t i = 0; i < count; ++i) {
+                const S s = row[i];
+                if constexpr (is_pair<S>) {
+                    out.real[i] = static_cast<part>(s.real);
+                    out.imaginary[i] = static_cast<part>(s.imaginary);
+                } else {
+                    out.real[i] = static_cast<part>(s);
+                    out.imaginary[i] = 0;
+                }
+            }
+        } else {
+            each(
+                count, [](S s) { return static_cast<W>(s); }, static_cast<W*>(to), row);
+        }
     });
 }
 
@@ -82,20 +100,50 @@ void load_byte(const uint8_t* from, int64_t stride, int32_t count, void* to)
 }
 
 template <operation Op, class W>
-void apply(const void* a, const void* b, int32_t count, void* result)
+void apply_complex(parts_of<W> a, parts_of<W> b, int32_t count, parts_of<W> out)
 {
-    const auto* const x = static_cast<const W*>(a);
-    const auto* const y = static_cast<const W*>(b);
-    auto* const out = static_cast<W*>(result);
-    if constexpr (Op == operation::divide && is_integer<W>) {
-        if (holds_zero<W>(y, count))
-            for (int32_t i = 0; i < count; ++i) out[i] = divide_or_fault(x[i], y[i]);
-        else
-            each(
-                count, [](W v, W w) { return static_cast<W>(quotient(v, w)); }, out, x, y);
+    using P = typename parts_of<W>::part;
+    if constexpr (Op == operation::add || Op == operation::subtract) {
+        const auto combine = [](P v, P w) { return operate<Op>(v, w); };
+        each(count, combine, out.real, a.real, b.real);
+        each(count, combine, out.imaginary, a.imaginary, b.imaginary);
+    } else if constexpr (Op == operation::multiply) {
+        each(
+            count, [](P ar, P ai, P br, P bi) { return ar * br - ai * bi; }, out.real, a.real, a.imaginary,
+            b.real, b.imaginary);
+        each(
+            count, [](P ar, P ai, P br, P bi) { return ai * br + ar * bi; }, out.imaginary, a.real,
+            a.imaginary, b.real, b.imaginary);
     } else {
         each(
-            count, [](W v, W w) { return operate<Op>(v, w); }, out, x, y);
+            count, [](P ar, P ai, P br, P bi) { return (ar * br + ai * bi) / (br * br + bi * bi); }, out.real,
+            a.real, a.imaginary, b.real, b.imaginary);
+        each(
+            count, [](P ar, P ai, P br, P bi) { return (ai * br - ar * bi) / (br * br + bi * bi); },
+            out.imaginary, a.real, a.imaginary, b.real, b.imaginary);
+    }
+}
+
+/// The result is a third block.
+template <operation Op, class W>
+void apply(const void* a, const void* b, int32_t count, void* result)
+{
+    if constexpr (is_pair<W>) {
+        apply_complex<Op, W>(parts_of<W>(a), parts_of<W>(b), count, parts_of<W>(result));
+    } else {
+        const auto* const x = static_cast<const W*>(a);
+        const auto* const y = static_cast<const W*>(b);
+        auto* const out = static_cast<W*>(result);
+        if constexpr (Op == operation::divide && is_integer<W>) {
+            if (holds_zero<W>(y, count))
+                for (int32_t i = 0; i < count; ++i) out[i] = divide_or_fault(x[i], y[i]);
+            else
+                each(
+                    count, [](W v, W w) { return static_cast<W>(quotient(v, w)); }, out, x, y);
+        } else {
+            each(
+                count, [](W v, W w) { return operate<Op>(v, w); }, out, x, y);
+        }
     }
 }
 
@@ -104,7 +152,10 @@ void store(const void* from, int32_t count, range limits, uint8_t* to, int64_t s
 {
     const auto* const values = static_cast<const W*>(from);
     with_row<T>(to, stride, [=](auto dst) {
-        if constexpr (is_real<W> && is_integer<T>) {
+        if constexpr (is_pair<W>) {
+            const parts_of<W> in(from);
+            for (int32_t i = 0; i < count; ++i) dst[i] = T{in.real[i], in.imaginary[i]};
+        } else if constexpr (is_real<W> && is_integer<T>) {
             if constexpr (Mode == rounding::saturate) {
                 alignas(64) W clamped[Arithmetic::block_pixels];
                 const bounds<W> b(limits);
@@ -114,13 +165,13 @@ void store(const void* from, int32_t count, range limits, uint8_t* to, int64_t s
             } else {
                 truncate<T>(values, count, dst);
             }
-        } else if constexpr (Mode == rounding::saturate && !is_pair<W>) {
+        } else if constexpr (Mode == rounding::saturate) {
             const bounds<W> b(limits);
             each(
                 count, [=](W v) { return static_cast<T>(clamp(v, b)); }, dst, values);
         } else {
             each(
-                count, [](W v) { return widened<T>(v); }, dst, values);
+                count, [](W v) { return static_cast<T>(v); }, dst, values);
         }
     });
 }

@@ -79,30 +79,11 @@ auto quotient(T a, T b)
     }
 }
 
-template <class Part>
-complex_pixel<Part> product(complex_pixel<Part> a, complex_pixel<Part> b)
-{
-    return {a.real * b.real - a.imaginary * b.imaginary, a.imaginary * b.real + a.real * b.imaginary};
-}
-
-template <class Part>
-complex_pixel<Part> quotient_of(complex_pixel<Part> a, complex_pixel<Part> b)
-{
-    const Part square = b.real * b.real + b.imaginary * b.imaginary;
-    return {(a.real * b.real + a.imaginary * b.imaginary) / square,
-            (a.imaginary * b.real - a.real * b.imaginary) / square};
-}
-
 /// The operator on a computing type: 32-bit integers wrap. Integer division is not among them.
 template <operation Op, class W>
 W operate(W a, W b)
 {
-    if constexpr (is_pair<W>) {
-        if constexpr (Op == operation::add) return {a.real + b.real, a.imaginary + b.imaginary};
-        if constexpr (Op == operation::subtract) return {a.real - b.real, a.imaginary - b.imaginary};
-        if constexpr (Op == operation::multiply) return product(a, b);
-        if constexpr (Op == operation::divide) return quotient_of(a, b);
-    } else if constexpr (Op == operation::min) {
+    if constexpr (Op == operation::min) {
         return b < a ? b : a;
     } else if constexpr (Op == operation::max) {
         return a < b ? b : a;
