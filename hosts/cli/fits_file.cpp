@@ -79,10 +79,15 @@ public:
     {
         new_image image(width_, height_, nominal_bits_, type_->encoding);
         const LONGLONG pixels = LONGLONG{width_} * height_;
+        const bool wide = type_->stored == ULONGLONG_IMG;
         int status = 0;
-        fits_read_img(file_.get(), type_->passed, index * pixels + 1, pixels, nullptr, image.data, nullptr,
-                      &status);
+        // The reader of unsigned 64-bit numbers refuses the lower half of them: taken as they are stored, then offset.
+        if (wide) fits_set_bscale(file_.get(), 1, 0, &status);
+        fits_read_img(file_.get(), wide ? TLONGLONG : type_->passed, index * pixels + 1, pixels, nullptr,
+                      image.data, nullptr, &status);
         check_fits(status);
+        for (size_t i = 7; wide && i < image.row_bytes * static_cast<size_t>(height_); i += 8)
+            image.data[i] ^= 0x80;
         return image.image;
     }
 
@@ -124,6 +129,13 @@ private:
                 throw failure("has no usable width and height");
         for (int i = 2; i < axes; ++i)
             if ((frames *= size[i]) > most_frames) throw failure("holds too many frames");
+        double offset = 0; // of unsigned 64-bit numbers, which are taken for signed ones
+        if (type == LONGLONG_IMG &&
+            fits_read_key(file_.get(), TDOUBLE, "BZERO", &offset, nullptr, &status) == 0 &&
+            offset == 9223372036854775808.0)
+            type = ULONGLONG_IMG;
+        status = 0;
+        fits_clear_errmsg();
         const auto found = std::ranges::find(fits_types, type, &fits_type::stored);
         if (found == std::end(fits_types)) throw failure("has an unknown kind of pixels");
         type_ = &*found;

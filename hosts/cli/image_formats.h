@@ -15,9 +15,6 @@ std::unique_ptr<frame_writer> create_tiff(const std::string& path, int frames);
 std::unique_ptr<frame_writer> create_png(const std::string& path);
 std::unique_ptr<frame_writer> create_fits(const std::string& path);
 
-/// One page of a TIFF file that is not simply rows of pixels: compressed, tiled, with a palette.
-com_ptr<IPixmat2> decode_tiff_page(const std::string& path, int page);
-
 /// Whether so many bytes of pixels can come from `stored` bytes of a file. No compressor makes more of a byte; what
 /// claims to be larger is damaged, or meant to fill the memory. (In real numbers: claims may be beyond any integer.)
 constexpr bool can_expand(int64_t stored, double bytes) noexcept

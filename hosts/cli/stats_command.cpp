@@ -47,6 +47,18 @@ public:
             return call_late(facet_.object.get(), m, values);
         };
 
+        // How many pixels have a value: MinimumCount and MaximumCount take the first pixel twice.
+        const auto count = [&](const variant& value) {
+            const method_info& m = find_method(facet_, "Count");
+            std::vector<variant> values(inputs_of(m).size(), variant::attach(missing_argument()));
+            values[0] = variant(image);
+            values[1] = value;
+            if (object) values.back() = variant(object.get());
+            return call_late(facet_.object.get(), m, values);
+        };
+
+        const variant minimum = ask("Minimum");
+        const variant maximum = ask("Maximum");
         const double mean = ask("Mean")->dblVal;
         const double squares = ask("SumSquares")->dblVal;
         const double variance = squares / pixels - mean * mean; // of all pixels, not of a sample
@@ -54,17 +66,17 @@ public:
         lines.push_back({"pixel type", "type", variant(widen(format_name(layout)).c_str())});
         lines.push_back({"width", "width", variant(r.right - r.left)});
         lines.push_back({"height", "height", variant(r.bottom - r.top)});
-        lines.push_back({"minimum", "minimum", ask("Minimum")});
-        lines.push_back({"  count", "minimum_count", ask("MinimumCount")});
-        lines.push_back({"  at", "minimum_position", in_image(ask("MinimumPosition"), r)});
-        lines.push_back({"maximum", "maximum", ask("Maximum")});
-        lines.push_back({"  count", "maximum_count", ask("MaximumCount")});
-        lines.push_back({"  at", "maximum_position", in_image(ask("MaximumPosition"), r)});
+        lines.push_back({"minimum", "minimum", minimum});
+        lines.push_back({"  count", "minimum_count", count(minimum)});
+        lines.push_back({"  at", "minimum_position", ask("MinimumPosition")});
+        lines.push_back({"maximum", "maximum", maximum});
+        lines.push_back({"  count", "maximum_count", count(maximum)});
+        lines.push_back({"  at", "maximum_position", ask("MaximumPosition")});
         lines.push_back({"mean", "mean", variant(mean)});
         lines.push_back({"standard deviation", "standard_deviation",
                          variant(std::isnan(variance) ? variance : std::sqrt(std::max(variance, 0.0)))});
         lines.push_back({"sum of squares", "sum_of_squares", variant(squares)});
-        lines.push_back({"centre of gravity", "centre_of_gravity", in_image(ask("CenterOfGravity"), r)});
+        lines.push_back({"centre of gravity", "centre_of_gravity", ask("CenterOfGravity")});
         lines.push_back({"range from", "range_minimum", ask("RangeMin", false)});
         lines.push_back({"range to", "range_maximum", ask("RangeMax", false)});
         lines.push_back({"all finite", "finite", ask("IsFinite", false)});
@@ -73,21 +85,6 @@ public:
     }
 
 private:
-    /// A position inside the area as one of the image.
-    static variant in_image(const variant& position, const rectangle& area)
-    {
-        if (const auto whole = query<ICoordinateInt>(position->punkVal)) {
-            const int32_t x = zelt::get(whole, &ICoordinateInt::get_X);
-            const int32_t y = zelt::get(whole, &ICoordinateInt::get_Y);
-            return variant(zelt::make_point(x + area.left, y + area.top).get());
-        }
-        const auto real = query<ICoordinateFloat>(position->punkVal);
-        if (!real) return position;
-        const double x = zelt::get(real, &ICoordinateFloat::get_X);
-        const double y = zelt::get(real, &ICoordinateFloat::get_Y);
-        return variant(zelt::make_float_point(x + area.left, y + area.top).get());
-    }
-
     library lib_;
     facet facet_;
 };

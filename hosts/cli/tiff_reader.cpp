@@ -1,4 +1,5 @@
 // Uncompressed TIFF pages are read here, in every pixel type there is; the others go to the image codecs.
+#include "codecs.h"
 #include "failure.h"
 #include "image_formats.h"
 #include "tiff_directory.h"
@@ -112,7 +113,7 @@ private:
         if (!can_expand(page.stored_bytes(), pixels / 8 * page.bits * page.samples))
             throw failure("the file is too small for " + std::to_string(page.width) + " x " +
                           std::to_string(page.height) + " pixels");
-        const com_ptr<IPixmat2> image = decode_tiff_page(path_, index);
+        const com_ptr<IPixmat2> image = codecs().decode_tiff_page(path_, index);
         const image_layout layout = layout_of(image.get());
         if (layout.width != page.width || layout.height != page.height)
             throw failure("the file is truncated or damaged");
