@@ -155,14 +155,9 @@ public:
 private:
     void take(const std::vector<std::string>& rest, given_texts& texts) const
     {
-        bool all_positional = false;
         for (size_t i = 0; i < rest.size(); ++i) {
             const std::string& word = rest[i];
-            if (word == "--" && !all_positional) {
-                all_positional = true;
-                continue;
-            }
-            if (all_positional || !word.starts_with("--")) {
+            if (!word.starts_with("--")) {
                 texts.add_positional(word);
                 continue;
             }

@@ -17,6 +17,7 @@ using formatter = std::string (*)(const VARIANT&);
 template <class T>
 std::string shortest(T value)
 {
+    if (std::isnan(value)) return "nan"; // whatever its sign
     char text[40];
     const auto [end, error] = std::to_chars(text, text + sizeof text, value);
     return std::string(text, end);
