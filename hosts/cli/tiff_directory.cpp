@@ -49,7 +49,8 @@ tiff_directory::tiff_directory(const std::string& path) : file_(path)
     read_at(0, order, 2);
     big_endian_ = order[0] == 'M';
     big_tiff_ = number_at(2, 2) == 43;
-    if (big_tiff_ && (number_at(4, 2) != 8 || number_at(6, 2) != 0)) throw failure("is not a known kind of TIFF");
+    if (big_tiff_ && (number_at(4, 2) != 8 || number_at(6, 2) != 0))
+        throw failure("is not a known kind of TIFF");
 
     std::unordered_set<uint64_t> seen;
     uint64_t directory = big_tiff_ ? number_at(8, 8) : number_at(4, 4);
