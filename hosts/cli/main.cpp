@@ -18,10 +18,10 @@ command_registration* first_command = nullptr;
 
 constexpr char examples[] = R"(Examples:
   zelt list                                           what can be called
-  zelt help Filters.Gauss                             one method: arguments, defaults, values
-  zelt call Filters.Gauss frame.tif 2.0 -o smooth.tif
+  zelt help FlatFielding.Flatten                      one method: arguments, defaults, values
+  zelt call Basic.Multiply frame.tif 1.5 -o brighter.tif
   zelt call Basic.Subtract frame.fits dark.fits -o clean.fits --rounding saturate
-  zelt call Statistics.FindPeaks star.tif 5 10 --json
+  zelt call Statistics.CenterOfGravity star.tif --json
   zelt stats stack.tif:1 stack.tif:2 --area 0,0,100,100
 Images are TIFF, PNG or FITS files. 'stack.tif:3' is the third page of a file, without a page all are meant.)";
 
