@@ -45,14 +45,26 @@ inline void check(HRESULT code)
     throw failure;
 }
 
+namespace detail {
+/// Checks a call whose failure must not be told with the texts that an earlier one left behind.
+template <class Call>
+void checked(Call&& call)
+{
+    SetErrorInfo(0, nullptr);
+    check(call());
+}
+} // namespace detail
+
 /// A new object of a class, by its name: "ZELT.Main2" is the root of the library.
 template <class Interface>
 com_ptr<Interface> create(std::string_view name)
 {
-    GUID id;
-    check(CLSIDFromProgID(widen(name).c_str(), &id));
     com_ptr<Interface> object;
-    check(CoCreateInstance(id, nullptr, CLSCTX_ALL, Interface::iid, object.put_void()));
+    detail::checked([&] {
+        GUID id;
+        const HRESULT hr = CLSIDFromProgID(widen(name).c_str(), &id);
+        return failed(hr) ? hr : CoCreateInstance(id, nullptr, CLSCTX_ALL, Interface::iid, object.put_void());
+    });
     return object;
 }
 
@@ -60,12 +72,14 @@ com_ptr<Interface> create(std::string_view name)
 inline com_ptr<IPixmat2> new_image(int32_t width, int32_t height, int32_t bits,
                                    PixmatEncoding encoding = PixmatEncoding_Unsigned)
 {
+    SetErrorInfo(0, nullptr);
     com_ptr<IPixmatDescriptor> descriptor;
     com_ptr<IPixmatFactory> factory;
-    check(CoCreateInstance(CLSID_PixmatDescriptor, nullptr, CLSCTX_ALL, IPixmatDescriptor::iid,
-                           descriptor.put_void()));
-    check(
-        CoCreateInstance(CLSID_PixmatFactory, nullptr, CLSCTX_ALL, IPixmatFactory::iid, factory.put_void()));
+    const auto make = [](const GUID& id, auto& object, const GUID& interface_id) {
+        check(CoCreateInstance(id, nullptr, CLSCTX_ALL, interface_id, object.put_void()));
+    };
+    make(CLSID_PixmatDescriptor, descriptor, IPixmatDescriptor::iid);
+    make(CLSID_PixmatFactory, factory, IPixmatFactory::iid);
     check(descriptor->put_Width(width));
     check(descriptor->put_Height(height));
     check(descriptor->put_Bits(bits));
@@ -80,7 +94,7 @@ inline com_ptr<IPixmat2> wrap(void* data, const image_layout& layout, bool read_
                               pixmat_release release = nullptr, void* context = nullptr)
 {
     com_ptr<IPixmat2> image;
-    check(WrapPixmat(layout, data, read_only, release, context, image.put()));
+    detail::checked([&] { return WrapPixmat(layout, data, read_only, release, context, image.put()); });
     return image;
 }
 
@@ -94,19 +108,19 @@ inline com_ptr<IPixmat2> wrap(void* data, int32_t width, int32_t height, int32_t
 inline com_ptr<IRectangle> make_rectangle(int32_t left, int32_t top, int32_t right, int32_t bottom)
 {
     com_ptr<IRectangle> object;
-    check(Common::MakeRectangle(left, top, right, bottom, object.put()));
+    detail::checked([&] { return Common::MakeRectangle(left, top, right, bottom, object.put()); });
     return object;
 }
 inline com_ptr<ICoordinateInt> make_point(int32_t x, int32_t y)
 {
     com_ptr<ICoordinateInt> object;
-    check(Common::MakeCoordinateInt(x, y, object.put()));
+    detail::checked([&] { return Common::MakeCoordinateInt(x, y, object.put()); });
     return object;
 }
 inline com_ptr<ICoordinateFloat> make_float_point(double x, double y)
 {
     com_ptr<ICoordinateFloat> object;
-    check(Common::MakeCoordinateFloat(x, y, object.put()));
+    detail::checked([&] { return Common::MakeCoordinateFloat(x, y, object.put()); });
     return object;
 }
 
@@ -160,9 +174,16 @@ inline constexpr bool is_out =
 template <class T>
 struct in_value {
     T value{};
+    /// DISP_E_OVERFLOW for a whole number that the argument cannot hold.
     template <class G>
     explicit in_value(const G& given) : value(static_cast<T>(given))
     {
+        static_assert(!(std::is_floating_point_v<G> && std::is_integral_v<T>), "a whole number is wanted");
+        if constexpr (std::is_same_v<T, VARIANT_BOOL> && std::is_same_v<G, bool>)
+            value = given ? VARIANT_TRUE : VARIANT_FALSE;
+        else if constexpr (std::is_integral_v<G> && std::is_integral_v<T>)
+            if (static_cast<G>(value) != given || (value < T{}) != (given < G{}))
+                throw error(DISP_E_OVERFLOW);
     }
     explicit in_value(const argument_info& a) : value(static_cast<T>(a.default_number)) {}
     T pass() noexcept { return value; }
@@ -209,7 +230,7 @@ template <>
 struct in_value<VARIANT> {
     variant value;
     template <class G>
-        requires std::is_constructible_v<variant, G>
+        requires(std::is_constructible_v<variant, G> && !std::is_convertible_v<G, const char*>) // no bool
     explicit in_value(const G& given) : value(given) {}
     template <class U>
     explicit in_value(const com_ptr<U>& given) : value(given.get())
@@ -231,10 +252,12 @@ struct carrier<T, false> : in_value<T> {
 
 /// The description of the argument at a place of a method, found by its member pointer.
 template <class Member>
-const argument_info& describe_argument(IDispatch* object, Member member, size_t place)
+const argument_info& describe_argument(IDispatch* object, const GUID& interface_id, Member member,
+                                       size_t place)
 {
     com_ptr<ITypeInfo> type;
     check(object->GetTypeInfo(0, LOCALE_USER_DEFAULT, type.put()));
+    if (type->Describe()->id != interface_id) throw error(E_NOINTERFACE);
     for (const method_info& m : type->Describe()->methods)
         if (std::memcmp(m.member, &member, sizeof member) == 0) {
             if (!m.arguments[place].optional) throw error(DISP_E_PARAMNOTOPTIONAL, m.arguments[place].name);
@@ -260,7 +283,7 @@ carrier<T> carry(Object* object, Member member, const Given& given)
     else if constexpr (Index < std::tuple_size_v<Given>)
         return carrier<T>(std::get<Index>(given));
     else
-        return carrier<T>(describe_argument(object, member, Place));
+        return carrier<T>(describe_argument(object, Object::iid, member, Place));
 }
 
 template <class T>
@@ -276,8 +299,9 @@ template <class I, class... Args, class Given, size_t... N>
 auto call(I* object, HRESULT (I::*member)(Args...) noexcept, const Given& given, std::index_sequence<N...>)
 {
     static_assert(std::tuple_size_v<Given> <= given_before<Args...>(sizeof...(Args)), "too many arguments");
-    std::tuple<carrier<Args>...> carriers{carry<Args, N, given_before<Args...>(N)>(object, member, given)...};
+    if (!object) throw error(E_POINTER, "call of a null object");
     SetErrorInfo(0, nullptr);
+    std::tuple<carrier<Args>...> carriers{carry<Args, N, given_before<Args...>(N)>(object, member, given)...};
     check((object->*member)(std::get<N>(carriers).pass()...));
     auto results = std::tuple_cat(taken<Args>(std::get<N>(carriers))...);
     if constexpr (std::tuple_size_v<decltype(results)> == 1)
