@@ -192,28 +192,39 @@ void register_complex(int size)
     zelt_bench::register_peer(name, "mulSpectrums", [f] { cv::mulSpectrums(f->a, f->b, f->dst, 0); });
 }
 
-/// What a call costs beside its pixels: through the interface, on 16 x 16, into a given output and a new one.
-void register_facet()
-{
-    const auto image = [] {
+/// Small images of the library, and the facet. Made at first use: before main() no class is registered.
+struct facet_call {
+    static com_ptr<IPixmat2> image()
+    {
         com_ptr<IPixmat2> i;
         CheckHResult(CreateImageFromLayout(packed_layout(16, 16, 8, PixmatEncoding_Unsigned), i.put()));
         return i;
+    }
+    static facet_call& get()
+    {
+        static facet_call call;
+        return call;
+    }
+    HRESULT add(const VARIANT& number, IPixmat2* output, IPixmat2** out)
+    {
+        return facet->Add(a.get(), number, output, out);
+    }
+
+    com_ptr<IBasicOps2> facet{make<CBasic2>()};
+    com_ptr<IPixmat2> a = image(), b = image(), dst = image(), result;
+    variant second{b.get()}, three{3};
+};
+
+/// What a call costs beside its pixels: through the interface, on 16 x 16, into a given output and a new one.
+void register_facet()
+{
+    const auto add = [](const std::string& name, auto call) {
+        zelt_bench::register_case(
+            name, [=] { return call(facet_call::get()) == S_OK; }, [=] { call(facet_call::get()); });
     };
-    const com_ptr<IBasicOps2> facet(make<CBasic2>());
-    const auto a = image(), b = image(), dst = image();
-    const auto second = std::make_shared<variant>(b.get());
-    const auto fits = [] { return true; };
-    zelt_bench::register_case(
-        "Facet/given-output/16",
-        [=] { return facet->Add(a.get(), *second->get(), dst.get(), nullptr) == S_OK; },
-        [=] { facet->Add(a.get(), *second->get(), dst.get(), nullptr); });
-    zelt_bench::register_case("Facet/number/16", fits,
-                              [=] { facet->Add(a.get(), *variant(3).get(), dst.get(), nullptr); });
-    zelt_bench::register_case("Facet/new-output/16", fits, [=] {
-        com_ptr<IPixmat2> result;
-        facet->Add(a.get(), *second->get(), nullptr, result.put());
-    });
+    add("Facet/given-output/16", [](facet_call& f) { return f.add(*f.second.get(), f.dst.get(), nullptr); });
+    add("Facet/number/16", [](facet_call& f) { return f.add(*f.three.get(), f.dst.get(), nullptr); });
+    add("Facet/new-output/16", [](facet_call& f) { return f.add(*f.second.get(), nullptr, f.result.put()); });
     const cv::Mat x(16, 16, CV_8U, cv::Scalar(1)), y(16, 16, CV_8U, cv::Scalar(2));
     const auto d = std::make_shared<cv::Mat>(16, 16, CV_8U);
     zelt_bench::register_peer("Facet/given-output/16", "add", [=] { cv::add(x, y, *d); });

@@ -135,7 +135,7 @@ void run_blocks(const block_job& job, block& first, block& second)
 /// True when rows of adjacent pixels follow each other without a gap, so that they are one row.
 bool is_packed(const plane& p, size extent) { return p.y_stride == p.x_stride * extent.width; }
 
-/// dst = a op b on adjacent pixels. A null y_stride is that of a single value.
+/// dst = a op b on adjacent pixels. A y stride of 0 is that of a single value.
 void run_direct(direct_function loop, plane a, plane b, const plane& dst, range limits, size extent,
                 bool in_one_row)
 {
@@ -157,6 +157,8 @@ outcome combine_colour(operator_choice chosen, const image& colour, const image&
 {
     const storage real = storage_of(other.layout);
     if (!is_float(real)) return outcome::unsupported;
+    const size extent{colour.layout.width, colour.layout.height};
+    if (extent.width <= 0 || extent.height <= 0) return outcome::done;
     const arithmetic_table& table = arithmetic_level();
     if (!colour_first) chosen.reversed = !chosen.reversed;
 
@@ -176,7 +178,7 @@ outcome combine_colour(operator_choice chosen, const image& colour, const image&
                     table.store[index(computing::u32)][index(storage::u8)][index(rounding::wrap)],
                     out,
                     {},
-                    {colour.layout.width, colour.layout.height}},
+                    extent},
                    first, second);
     }
     return outcome::done;

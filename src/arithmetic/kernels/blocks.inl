@@ -32,6 +32,36 @@ struct parts_of {
     explicit parts_of(const void* block) : parts_of(const_cast<void*>(block)) {}
 };
 
+/// Parts of adjacent pixels: what the compiler sees as two numbers of one pixel, and can take apart.
+template <class Part, int Place>
+struct contiguous_parts {
+    uint8_t* first;
+    pixel_reference<Part> operator[](int64_t x) const
+    {
+        return first + (2 * x + Place) * static_cast<int64_t>(sizeof(Part));
+    }
+};
+template <class Part, class Real, class Imaginary>
+struct row_of_parts {
+    Real real;
+    Imaginary imaginary;
+};
+
+template <class Part>
+auto rows_of_parts(contiguous_row<complex_pixel<Part>> row)
+{
+    using real = contiguous_parts<Part, 0>;
+    using imaginary = contiguous_parts<Part, 1>;
+    return row_of_parts<Part, real, imaginary>{{row.first}, {row.first}};
+}
+template <class Part>
+auto rows_of_parts(strided_row<complex_pixel<Part>> row)
+{
+    using part = strided_row<Part>;
+    return row_of_parts<Part, part, part>{{row.first, row.stride},
+                                          {row.first + static_cast<int64_t>(sizeof(Part)), row.stride}};
+}
+
 template <class W, class S>
 void load(const uint8_t* from, int64_t stride, int32_t count, void* to)
 {
@@ -39,15 +69,17 @@ void load(const uint8_t* from, int64_t stride, int32_t count, void* to)
         if constexpr (is_pair<W>) {
             using part = decltype(W::real);
             const parts_of<W> out(to);
-            for (int32_t i = 0; i < count; ++i) {
-                const S s = row[i];
-                if constexpr (is_pair<S>) {
-                    out.real[i] = static_cast<part>(s.real);
-                    out.imaginary[i] = static_cast<part>(s.imaginary);
-                } else {
-                    out.real[i] = static_cast<part>(s);
-                    out.imaginary[i] = 0;
+            if constexpr (is_pair<S>) {
+                using stored = decltype(S::real);
+                const auto [real, imaginary] = rows_of_parts<stored>(row);
+                for (int32_t i = 0; i < count; ++i) {
+                    out.real[i] = static_cast<part>(static_cast<stored>(real[i]));
+                    out.imaginary[i] = static_cast<part>(static_cast<stored>(imaginary[i]));
                 }
+            } else {
+                each(
+                    count, [](S s) { return static_cast<part>(s); }, out.real, row);
+                for (int32_t i = 0; i < count; ++i) out.imaginary[i] = 0;
             }
         } else {
             each(
@@ -56,14 +88,24 @@ void load(const uint8_t* from, int64_t stride, int32_t count, void* to)
     });
 }
 
+template <class W>
+struct flag_of_width {
+    using type = int32_t;
+};
+template <>
+struct flag_of_width<double> {
+    using type = int64_t;
+};
+
 /// True when every value, truncated, fits into 32 bits. NaN does not.
 template <class W>
 bool fit_32_bits(const W* values, int32_t count)
 {
-    int32_t outside = 0;
+    typename flag_of_width<W>::type outside =
+        0; // one comparison at a time: the compiler takes several values then
     for (int32_t i = 0; i < count; ++i) {
-        const W v = values[i];
-        outside |= v >= static_cast<W>(-0x1p31) && v < static_cast<W>(0x1p31) ? 0 : 1;
+        outside |= values[i] >= static_cast<W>(-0x1p31) ? 0 : 1;
+        outside |= values[i] < static_cast<W>(0x1p31) ? 0 : 1;
     }
     return outside == 0;
 }
@@ -154,7 +196,16 @@ void store(const void* from, int32_t count, range limits, uint8_t* to, int64_t s
     with_row<T>(to, stride, [=](auto dst) {
         if constexpr (is_pair<W>) {
             const parts_of<W> in(from);
-            for (int32_t i = 0; i < count; ++i) dst[i] = T{in.real[i], in.imaginary[i]};
+            const auto [real, imaginary] = rows_of_parts<typename parts_of<W>::part>(dst);
+#ifdef __clang__
+#pragma clang loop vectorize(assume_safety)
+#else
+#pragma GCC ivdep
+#endif
+            for (int32_t i = 0; i < count; ++i) {
+                real[i] = in.real[i];
+                imaginary[i] = in.imaginary[i];
+            }
         } else if constexpr (is_real<W> && is_integer<T>) {
             if constexpr (Mode == rounding::saturate) {
                 alignas(64) W clamped[Arithmetic::block_pixels];

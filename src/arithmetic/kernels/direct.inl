@@ -10,14 +10,19 @@ template <class T>
 inline constexpr T highest = is_signed<T> ? static_cast<T>((1u << (8 * sizeof(T) - 1)) - 1u)
                                           : static_cast<T>(-1);
 
-/// The upper half of a 16-bit product; the lower half is the wrapped product.
 template <class T>
-T upper_half(T a, T b)
+struct twice_as_wide {
+    using type = uint32_t;
+};
+template <>
+struct twice_as_wide<uint8_t> {
+    using type = uint16_t;
+};
+
+/// The upper half of a product; the lower half is the wrapped product.
+inline int16_t upper_half(int16_t a, int16_t b)
 {
-    if constexpr (is_signed<T>)
-        return static_cast<T>((int32_t{a} * int32_t{b}) >> 16);
-    else
-        return static_cast<T>((uint32_t{a} * uint32_t{b}) >> 16);
+    return static_cast<int16_t>((int32_t{a} * int32_t{b}) >> 16);
 }
 
 /// One and two bytes under Saturate: first limited to the type, then to the nominal range, which lies inside.
@@ -28,11 +33,13 @@ T saturated(T a, T b, bounds<T> limits)
     const T wrapped = operate<Op>(a, b);
     bool beyond = false;
     T limit = highest<T>;
-    if constexpr (!is_signed<T>) {
+    if constexpr (!is_signed<T> && Op == operation::multiply) {
+        using wide = typename twice_as_wide<T>::type;
+        const auto product = static_cast<wide>(wide{a} * wide{b});
+        return static_cast<T>(product < limits.upper ? product : limits.upper);
+    } else if constexpr (!is_signed<T>) {
         if constexpr (Op == operation::add) beyond = wrapped < a;
         if constexpr (Op == operation::subtract) beyond = a < b;
-        if constexpr (Op == operation::multiply)
-            beyond = sizeof(T) == 1 ? static_cast<uint16_t>(a * b) > 255 : upper_half(a, b) != 0;
         const T v = beyond ? limit : wrapped;
         return v < limits.upper ? v : limits.upper;
     } else {
