@@ -85,12 +85,13 @@ bool read_pair(SAFEARRAY* array, number* n) noexcept
 
 bool read_array(const VARIANT& v, number* n) noexcept
 {
+    if (v.vt != (VT_ARRAY | VT_R4) && v.vt != (VT_ARRAY | VT_R8)) return false;
     LONG low = 0, high = 0;
     if (SafeArrayGetDim(v.parray) != 1 || failed(SafeArrayGetLBound(v.parray, 1, &low)) ||
         failed(SafeArrayGetUBound(v.parray, 1, &high)) || int64_t{high} - low != 1)
         return false;
     if (v.vt == (VT_ARRAY | VT_R4)) return read_pair<float>(v.parray, n);
-    return v.vt == (VT_ARRAY | VT_R8) && read_pair<double>(v.parray, n);
+    return read_pair<double>(v.parray, n);
 }
 
 HRESULT read_number(const second_operand& b, bool for_complex, number* n) noexcept

@@ -318,10 +318,13 @@ TEST_F(Basic2, ReadsComplexNumbersInEachForm)
     matrix.parray = SafeArrayCreate(VT_R8, 2, square);
     VARIANT none = empty_variant();
     none.vt = VT_ARRAY | VT_R8;
+    VARIANT code = empty_variant();
+    code.vt = VT_ERROR;
+    code.llVal = 0x3a3a; // not to be taken for an array's address
     com_ptr<IPixmat2> result;
     for (const variant& b :
          {array_of<double>(VT_R8, {1, 2, 3}), array_of<double>(VT_R8, {1}), array_of<int32_t>(VT_I4, {1, 2}),
-          variant::attach(matrix), variant::attach(none), variant(L"1")})
+          variant::attach(matrix), variant::attach(none), variant::attach(code), variant(L"1")})
         EXPECT_EQ(facet->Add(a.get(), *b.get(), nullptr, result.put()), E_INVALIDARG);
 }
 

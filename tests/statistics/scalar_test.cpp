@@ -203,8 +203,12 @@ TEST(Scalars, OfLargeIntegersAreThoseOfAddingDoublesOneByOne)
 {
     for_each_type<uint8_t, uint16_t, uint32_t, int8_t, int16_t, int32_t>([]<class T>(pixel<T>) {
         using limits = std::numeric_limits<T>;
-        const auto high = [](int x, int y) { return static_cast<T>(limits::max() - (x * 7 + y * 3) % 5); };
-        const auto low = [](int x, int y) { return static_cast<T>(limits::min() / 3 + (x + y) % 100); };
+        const auto high = [](int x, int y) {
+            return static_cast<T>(int64_t{limits::max()} - (x * 7 + y * 3) % 5);
+        };
+        const auto low = [](int x, int y) {
+            return static_cast<T>(int64_t{limits::min()} / 3 + (x + y) % 100);
+        };
         check_image<T>({3001, 9}, memory_layout::packed, high);
         check_image<T>({3001, 9}, memory_layout::packed,
                        [&](int x, int y) { return (x / 1000 + y) % 2 != 0 ? low(x, y) : high(x, y); });
