@@ -2,6 +2,8 @@
 
 #include "failure.h"
 
+#include <zelt/com/bstr.h>
+
 #include <dlfcn.h>
 
 namespace cli {
@@ -12,12 +14,26 @@ const codec_table& codecs() { return *zelt_codec_table(); }
 
 #else
 
+namespace {
+
+/// The bare name when the library's own place cannot be told.
+std::string path_beside_library(const char* name)
+{
+    Dl_info info = {};
+    if (!dladdr(reinterpret_cast<const void*>(&Qor::SysFreeString), &info) || !info.dli_fname) return name;
+    const std::string library = info.dli_fname;
+    const size_t slash = library.rfind('/');
+    return slash == std::string::npos ? std::string(name) : library.substr(0, slash + 1).append(name);
+}
+
+} // namespace
+
 const codec_table& codecs()
 {
     static const codec_table* table = nullptr;
     if (table) return *table;
-    // Found where the program finds libzelt. Never unloaded: the codecs leave threads and handlers behind.
-    void* const module = dlopen(codec_module_name, RTLD_NOW);
+    // Beside libzelt. Never unloaded: the codecs leave threads and handlers behind.
+    void* const module = dlopen(path_beside_library(codec_module_name).c_str(), RTLD_NOW);
     if (!module) throw failure(std::string("the image codecs cannot be loaded: ") + dlerror());
     const auto entry = reinterpret_cast<codec_entry*>(dlsym(module, codec_entry_name));
     if (!entry) throw failure(std::string("the image codecs cannot be loaded: ") + dlerror());

@@ -33,8 +33,9 @@ bool is_other_image_name(const fs::path& path)
 std::string stem_of(const std::string& exposure)
 {
     const image_name name = parse_image_name(exposure);
-    const std::string page = name.page ? "_" + std::to_string(name.page) : "";
-    return fs::path(name.path).stem().string() + page;
+    std::string stem = fs::path(name.path).stem().string();
+    if (name.page) stem.append("_").append(std::to_string(name.page));
+    return stem;
 }
 
 std::string file_in_folder(const std::string& exposure, bool only_tiff_or_fits)
