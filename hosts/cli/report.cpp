@@ -3,7 +3,6 @@
 #include "correct_outputs.h"
 #include "output_file.h"
 #include "report_charts.h"
-#include "report_pictures.h"
 #include "report_style.h"
 #include "report_text.h"
 
@@ -22,9 +21,16 @@ where the flat frames, less the dark, have more than half of their highest light
 raise it; so do noise and the scene itself, which a correction leaves alone. <b>Fine</b> is the same after each pixel was
 divided by the mean of its surroundings (31 &#215; 31 pixels), so that only small things count.</p>
 <p>Before stands for the exposure less the dark, after for the corrected one. Pictures are stretched for the eye: black and
-white are the values below and above which half a percent of the pixels lie (of the evenly lit ones, except for dark and
-light). Histograms count on a logarithmic scale.</p>
+white are the values below and above which half a percent of the pixels lie (for the gain, and for the white of
+corrected exposures, of the evenly lit ones). Histograms count on a logarithmic scale.</p>
 )";
+
+/// On one line of the page.
+std::string unbroken(std::string text)
+{
+    if (const size_t blank = text.find(' '); blank != std::string::npos) text.replace(blank, 1, "&#160;");
+    return text;
+}
 
 std::string tile(const std::string& name, const std::string& before, const std::string& after,
                  const std::string& note)
@@ -52,16 +58,21 @@ void correction_report::add_tile(const std::string& name, const std::string& bef
     tiles_ += tile(name, before, after, note);
 }
 
-std::string correction_report::figure_with(const std::string& title, IPixmat2* image, const std::string& note,
-                                           bool stretched_for_all) const
+/// Where only a part of the field is lit, the rest would decide what is white.
+shades correction_report::shades_of_lit(IPixmat2* image) const
 {
-    // Where only a part of the field is lit, the rest would decide what is black and white.
-    const bool choose = lit_ && !stretched_for_all && lit_->share() > 0.01;
-    const picture p = make_picture(image, choose ? lit_->row(0) : nullptr);
+    const bool enough = lit_ && lit_->share() > 0.01;
+    return shades_of(image, enough ? lit_->row(0) : nullptr);
+}
+
+std::string correction_report::figure_with(const std::string& title, IPixmat2* image, const std::string& note,
+                                           shades range) const
+{
+    const picture p = make_picture(image, range);
     return joined("<figure><img alt=\"", escaped(title), "\" width=\"", std::to_string(p.width),
                   "\" height=\"", std::to_string(p.height), "\" src=\"", p.uri, "\"/><figcaption><b>",
-                  escaped(title), "</b> ", escaped(note), "<br/>black is ", figure(p.black), ", white ",
-                  figure(p.white), "</figcaption></figure>\n");
+                  escaped(title), "</b> ", escaped(note), "<br/>black is ", figure(range.black), ", white ",
+                  figure(range.white), "</figcaption></figure>\n");
 }
 
 void correction_report::start(const correction_basis& b)
@@ -74,15 +85,16 @@ void correction_report::start(const correction_basis& b)
             tile("Flat frame, uneven", percent(b.flat_before.all), percent(b.flat_after.all),
                  "the first of " + std::to_string(b.flats) + ", corrected with the gain of the others");
     const auto frames = [](int n) { return "mean of " + counted(static_cast<size_t>(n), "frame"); };
-    reference_figures_ = figure_with("Dark reference", b.refs->dark(), frames(b.darks), true);
+    reference_figures_ =
+        figure_with("Dark reference", b.refs->dark(), frames(b.darks), shades_of(b.refs->dark()));
     if (b.lit)
-        reference_figures_ +=
-            figure_with("Light", b.refs->light(), frames(b.flats) + ", less the dark", true);
+        reference_figures_ += figure_with("Light", b.refs->light(), frames(b.flats) + ", less the dark",
+                                          shades_of(b.refs->light()));
     if (!b.refs->gain()) return;
     const std::string unit =
         options_.gain.kind == gain_kind::fixed ? ", stored as " + figure(b.refs->gain_unit()) + " for 1" : "";
-    reference_figures_ +=
-        figure_with("Gain reference", b.refs->gain(), "what pixels are multiplied by" + unit);
+    reference_figures_ += figure_with("Gain reference", b.refs->gain(), "a factor for each pixel" + unit,
+                                      shades_of_lit(b.refs->gain()));
     own_tiles_ += tile("Dead or too dark", figure(static_cast<double>(b.refs->pixels_at_highest())), "",
                        "pixels with the highest gain, " + figure(b.refs->highest_gain()));
 }
@@ -105,17 +117,22 @@ void correction_report::frame(const corrected_frame& f, IPixmat2* raw, IPixmat2*
 
     exposures_ += "<h2>" + escaped(base_name(f.name)) + "</h2>\n<p class=\"soft\">";
     if (std::isfinite(f.after.all))
-        exposures_ += "Uneven: " + percent(f.before.all) + " before, " + percent(f.after.all) +
-                      " after; fine: " + percent(f.before.fine) + " before, " + percent(f.after.fine) +
-                      " after. ";
+        exposures_ +=
+            joined("Uneven: ", unbroken(percent(f.before.all)), " before, ", unbroken(percent(f.after.all)),
+                   " after; fine: ", unbroken(percent(f.before.fine)), " before, ",
+                   unbroken(percent(f.after.fine)), " after. ");
     if (f.limited)
         exposures_ +=
             counted(f.limited, "pixel") + " too bright for " + format_name(f.format) + ", limited. ";
     if (f.saturated)
         exposures_ += "The short exposure stands in for " + counted(f.saturated, "saturated pixel") + ".";
-    exposures_ += "</p>\n<div class=\"pictures\">" + figure_with("Raw", raw, base_name(f.name)) +
-                  figure_with("Corrected", corrected, base_name(f.output));
-    if (truth_) exposures_ += figure_with("Truth", truth_.get(), "what a perfect camera would show");
+    exposures_ += "</p>\n<div class=\"pictures\">" +
+                  figure_with("Raw", raw, base_name(f.name), shades_of(raw)) +
+                  figure_with("Corrected", corrected, base_name(f.output),
+                              {shades_of(corrected).black, shades_of_lit(corrected).white});
+    if (truth_)
+        exposures_ +=
+            figure_with("Truth", truth_.get(), "what a perfect camera would show", shades_of(truth_.get()));
     exposures_ += "</div>\n" + charts(raw, corrected);
 }
 

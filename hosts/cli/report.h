@@ -2,6 +2,7 @@
 #pragma once
 
 #include "correct_job.h"
+#include "report_pictures.h"
 
 #include <string>
 #include <vector>
@@ -30,7 +31,8 @@ public:
 
 private:
     std::string figure_with(const std::string& title, IPixmat2* image, const std::string& note,
-                            bool stretched_for_all = false) const;
+                            shades range) const;
+    shades shades_of_lit(IPixmat2* image) const;
     std::string charts(IPixmat2* raw, IPixmat2* corrected) const;
     void add_row(const std::string& name, const std::string& kind, const frame_numbers& n,
                  const unevenness& u);

@@ -34,10 +34,10 @@ struct scale {
 scale horizontal(double low, double high) { return {low, high > low ? high : low + 1, left, width - right}; }
 scale vertical(double low, double high) { return {low, high > low ? high : low + 1, height - bottom, top}; }
 
-/// Round numbers that divide a range into about five parts.
+/// Round numbers that divide a range into about six parts.
 std::vector<double> ticks(double low, double high)
 {
-    const double raw = (high - low) / 5;
+    const double raw = (high - low) / 8;
     const double power = std::pow(10.0, std::floor(std::log10(raw)));
     double step = 10 * power;
     for (double factor : {5.0, 2.0, 1.0})
@@ -139,7 +139,7 @@ std::string histogram_chart(const std::vector<chart_line>& lines)
         if (range[1] > high) high = range[1];
         whole = whole && is_whole(l.image.get());
     }
-    if (!(high >= low)) return {};
+    if (!(high >= low) || !std::isfinite(high - low)) return {};
     constexpr size_t most_bins = 128;
     double step = (high - low) / most_bins;
     if (whole) step = std::ceil(std::max(step, 1.0)); // else some bins would hold more values than others
@@ -186,6 +186,7 @@ std::string profile_chart(const std::vector<chart_line>& lines, int middle)
     std::ranges::sort(all);
     const size_t outliers = all.size() / 500; // hot pixels leave the chart rather than flatten it
     const double low = all[outliers], high = all[all.size() - 1 - outliers];
+    if (!std::isfinite(high - low)) return {};
     const double margin = high > low ? (high - low) * 0.06 : 1;
     const int pixels = layout_of(lines[0].image.get()).width;
     frame_of_chart f{"Pixel values along a row",

@@ -11,24 +11,28 @@ using namespace Qor::Luxar;
 namespace cli {
 namespace {
 
-uint8_t shade(double value, const picture& p)
+uint8_t shade(double value, const shades& p)
 {
-    const double share = p.white > p.black ? (value - p.black) / (p.white - p.black) : 0.5;
-    return static_cast<uint8_t>(std::clamp(share, 0.0, 1.0) * 255 + 0.5);
+    // Halved first: the difference of two very large values would not be finite.
+    const double share = p.white > p.black ? (value / 2 - p.black / 2) / (p.white / 2 - p.black / 2) : 0.5;
+    return static_cast<uint8_t>(share > 0 ? std::min(share, 1.0) * 255 + 0.5 : 0);
 }
 
 } // namespace
 
-picture make_picture(IPixmat2* image, const uint8_t* chosen, int width)
+shades shades_of(IPixmat2* image, const uint8_t* chosen)
+{
+    const auto range = quantiles(image, {0.005, 0.995}, chosen);
+    return {range[0], range[1]};
+}
+
+picture make_picture(IPixmat2* image, shades range, int width)
 {
     real_rows rows(image);
     const int block = std::max(1, (rows.width() + width - 1) / width);
     picture p;
     p.width = (rows.width() + block - 1) / block;
     p.height = (rows.height() + block - 1) / block;
-    const auto range = quantiles(image, {0.005, 0.995}, chosen);
-    p.black = range[0];
-    p.white = range[1];
 
     const new_image small(p.width, p.height, 8, PixmatEncoding_Unsigned);
     std::vector<double> sums(static_cast<size_t>(p.width));
@@ -46,7 +50,7 @@ picture make_picture(IPixmat2* image, const uint8_t* chosen, int width)
         }
         uint8_t* out = small.data + static_cast<size_t>(y) * small.row_bytes;
         for (size_t x = 0; x < sums.size(); ++x)
-            out[x] = counts[x] ? shade(sums[x] / counts[x], p) : uint8_t{0};
+            out[x] = counts[x] ? shade(sums[x] / counts[x], range) : uint8_t{0};
     }
     const std::vector<uint8_t> png = codecs().encode_png(small.image.get());
     p.uri = "data:image/png;base64," + base64(png.data(), png.size());
