@@ -181,21 +181,39 @@ void add_one_by_one(sample_block b, four_sums& s)
     }
 }
 
-/// Adds what the block as a whole has where no sum can pass 2^53 on the way, else pixel by pixel.
+inline constexpr double exact_limit = 9007199254740992.0; // 2^53
+
+/// No sum can pass 2^53 on the way through the block.
 template <class T>
-void add_integers(sample_block b, block_sums<T> block, four_sums& s)
+bool stays_exact(sample_block b, const block_sums<T>& block, const four_sums& s)
 {
     const double low = __builtin_fabs(static_cast<double>(block.minimum));
     const double high = __builtin_fabs(static_cast<double>(block.maximum));
     const double largest = low > high ? low : high;
     const double most = largest * b.n;
-    const auto x = static_cast<double>(b.x);
-    const auto y = static_cast<double>(b.y);
-    constexpr double limit = 9007199254740992.0;
-    if (__builtin_fabs(s.sum) + most < limit && s.squares + largest * most < limit &&
-        __builtin_fabs(s.moment_x) + static_cast<double>(b.x_of(b.n - 1)) * most < limit &&
-        __builtin_fabs(s.moment_y) + y * most < limit) {
+    return __builtin_fabs(s.sum) + most < exact_limit && s.squares + largest * most < exact_limit &&
+           __builtin_fabs(s.moment_x) + static_cast<double>(b.x_of(b.n - 1)) * most < exact_limit &&
+           __builtin_fabs(s.moment_y) + static_cast<double>(b.y) * most < exact_limit;
+}
+
+/// No sum can pass 2^53 whatever the pixels of the grid are: true for 8 bits in all but huge images.
+template <class T>
+bool always_exact(const sample_grid& g)
+{
+    if constexpr (!is_integer<T> || sizeof(T) > 2) return false;
+    const double largest = sizeof(T) == 1 ? 255.0 : 65535.0;
+    const double pixels = static_cast<double>(g.width) * static_cast<double>(g.height);
+    return largest * pixels * (largest + g.width + g.height) < exact_limit;
+}
+
+/// Adds what the block as a whole has where no sum can pass 2^53 on the way, else pixel by pixel.
+template <class T>
+void add_integers(sample_block b, const block_sums<T>& block, bool exact, four_sums& s)
+{
+    if (exact || stays_exact<T>(b, block, s)) {
         const auto sum = static_cast<double>(block.sum);
+        const auto x = static_cast<double>(b.x);
+        const auto y = static_cast<double>(b.y);
         s.sum += sum;
         s.squares += static_cast<double>(block.squares);
         s.moment_x += x * sum + static_cast<double>(b.step) * static_cast<double>(block.weighted);
@@ -211,10 +229,10 @@ block_sums<T> sum_exact_lanes(sample_block b)
 {
     row_lanes lanes{};
     const value_range<T> range = add_lanes<T>(b.p, b.n, 0.0, 1.0, lanes);
-    constexpr double limit = 9007199254740992.0;
     const double sum = sum_of_lanes(lanes.sum), squares = sum_of_lanes(lanes.squares),
                  weighted = sum_of_lanes(lanes.weighted);
-    const bool usable = __builtin_fabs(sum) < limit && squares < limit && __builtin_fabs(weighted) < limit;
+    const bool usable =
+        __builtin_fabs(sum) < exact_limit && squares < exact_limit && __builtin_fabs(weighted) < exact_limit;
     if (!usable) return {0, 0, 0, range.minimum, range.maximum};
     return {static_cast<int64_t>(sum), static_cast<int64_t>(squares), static_cast<int64_t>(weighted),
             range.minimum, range.maximum};
@@ -226,6 +244,7 @@ struct scanner {
     four_sums s;
     row_lanes lanes; ///< of the row at hand, float and double only
     double row_sum;
+    bool exact; ///< in any order, integers only
 
     void add(sample_block b)
     {
@@ -247,7 +266,7 @@ struct scanner {
             else
                 block = sum_block<T>(b.p, b.n);
             compare_block<T>(b, {block.minimum, block.maximum}, e);
-            add_integers<T>(b, block, s);
+            add_integers<T>(b, block, exact, s);
         }
     }
     void end_row(int64_t y)
@@ -277,6 +296,7 @@ void scan(const sample_grid& grid, scan_result& result)
     const int length = side_by_side ? max_block / static_cast<int>(sizeof(T)) : gathered;
 
     scanner<T> scanner{};
+    scanner.exact = always_exact<T>(g);
     T corner{};
     gather<T>(g.first, 0, 1, g.pixel_bytes, &corner);
     scanner.e = {{corner, corner}, 1, 1, {0, 0}, {0, 0}};
