@@ -169,7 +169,6 @@ void batch::correct_file(size_t index)
             throw failure(options_.shorts[index] + ": has " + std::to_string(shorts->count()) + " pages, " +
                           name + " has " + std::to_string(pages));
     }
-    make_folder(std::filesystem::path(outputs_[index]).parent_path().string());
     const auto writer = create_image(outputs_[index], pages);
     for (int page = 0; page < pages; ++page) {
         const com_ptr<IPixmat2> raw = reader->read(page);
@@ -194,6 +193,8 @@ void batch::correct_file(size_t index)
 size_t batch::run()
 {
     make_basis();
+    for (const std::string& output : outputs_)
+        make_folder(std::filesystem::path(output).parent_path().string());
     progress_.clear();
     for (correction_watcher* w : watchers_) w->start(basis_);
     size_t failures = 0;
