@@ -11,8 +11,8 @@
 #include <algorithm>
 #include <cstdint>
 #include <cstring>
+#include <map>
 #include <memory>
-#include <random>
 
 namespace {
 
@@ -39,18 +39,41 @@ Arithmetic::image image_of(const cv::Mat& m)
 }
 
 template <class T>
-cv::Mat random_frame(int size, unsigned seed, int channels = 1)
+cv::Mat random_frame(int size, uint32_t seed, int channels)
 {
     cv::Mat m(size, size, CV_MAKETYPE(cv_depth<T>, channels));
-    std::mt19937 random(seed);
     auto* const p = m.ptr<T>();
-    for (size_t i = 0; i < m.total() * static_cast<size_t>(channels); ++i)
-        p[i] = static_cast<T>(1 + random() % 100); // no zero divisors
+    for (size_t i = 0; i < m.total() * static_cast<size_t>(channels); ++i) {
+        seed = seed * 1664525u + 1013904223u;
+        p[i] = static_cast<T>(1 + (seed >> 16) % 100); // no zero divisors
+    }
     return m;
 }
 
 struct frames {
     cv::Mat a, b, dst;
+};
+
+/// One set of frames for each type and size, made at first use.
+template <class T, int Channels = 1>
+frames& frames_of(int size)
+{
+    static std::map<int, frames> sets;
+    frames& f = sets[size];
+    if (f.a.empty())
+        f = {random_frame<T>(size, 1, Channels), random_frame<T>(size, 2, Channels),
+             cv::Mat(size, size, CV_MAKETYPE(cv_depth<T>, Channels))};
+    return f;
+}
+
+size_t pixels_of(int size) { return static_cast<size_t>(size) * static_cast<size_t>(size); }
+
+/// Frames that are there once they are looked at.
+struct lazy_frames {
+    int size;
+    frames& (*get)(int size);
+
+    frames* operator->() const { return &get(size); }
 };
 
 struct operation_case {
@@ -97,8 +120,8 @@ T expected(method m, T a, T b, int rounding)
 template <class T>
 void register_images(const operation_case& op, const std::string& type, int size)
 {
-    const auto f = std::make_shared<frames>();
-    *f = {random_frame<T>(size, 1), random_frame<T>(size, 2), cv::Mat(size, size, cv_depth<T>)};
+    const lazy_frames f{size, frames_of<T>};
+    const size_t pixels = pixels_of(size);
     for (const int rounding : {wrap, saturate}) {
         if (op.m == method::min && rounding == saturate) continue; // one loop for both
         const std::string name = std::string(op.name) + "/" + type +
@@ -118,7 +141,7 @@ void register_images(const operation_case& op, const std::string& type, int size
                 return true;
             },
             work);
-        zelt_bench::register_copy(name, f->dst.total() * sizeof(T) * 3 / 2);
+        zelt_bench::register_copy(name, pixels * sizeof(T) * 3 / 2);
         zelt_bench::register_peer(name, op.peer_name, [f, op] { op.peer(f->a, f->b, f->dst); });
     }
 }
@@ -126,8 +149,8 @@ void register_images(const operation_case& op, const std::string& type, int size
 template <class T>
 void register_number(const std::string& type, int size, Arithmetic::number n, const char* kind)
 {
-    const auto f = std::make_shared<frames>();
-    *f = {random_frame<T>(size, 1), {}, cv::Mat(size, size, cv_depth<T>)};
+    const lazy_frames f{size, frames_of<T>};
+    const size_t pixels = pixels_of(size);
     for (const auto& [what, m] : {std::pair{"Add", method::add}, {"Multiply", method::multiply}}) {
         const std::string name = std::string(what) + "/" + type + "-" + kind + "/" + std::to_string(size);
         const auto work = [=, m = m] {
@@ -142,7 +165,7 @@ void register_number(const std::string& type, int size, Arithmetic::number n, co
                 return f->dst.at<T>(1, 1) == static_cast<T>(adds ? a + n.real : a * n.real);
             },
             work);
-        zelt_bench::register_copy(name, f->dst.total() * sizeof(T));
+        zelt_bench::register_copy(name, pixels * sizeof(T));
         zelt_bench::register_peer(name, adds ? "add" : "multiply", [=] {
             adds ? cv::add(f->a, cv::Scalar(n.real), f->dst) : cv::multiply(f->a, n.real, f->dst);
         });
@@ -151,11 +174,10 @@ void register_number(const std::string& type, int size, Arithmetic::number n, co
 
 void register_mixed(int size)
 {
-    const auto f = std::make_shared<frames>();
-    *f = {random_frame<uint8_t>(size, 1), random_frame<float>(size, 2), cv::Mat(size, size, CV_8U)};
+    const lazy_frames f{size, frames_of<uint8_t>}, real{size, frames_of<float>};
     const std::string name = "Add/u8-plus-f32/" + std::to_string(size);
-    const auto work = [f] {
-        Arithmetic::combine(method::add, saturate, image_of<uint8_t>(f->a), image_of<float>(f->b),
+    const auto work = [=] {
+        Arithmetic::combine(method::add, saturate, image_of<uint8_t>(f->a), image_of<float>(real->b),
                             image_of<uint8_t>(f->dst));
     };
     zelt_bench::register_case(
@@ -163,17 +185,16 @@ void register_mixed(int size)
         [=] {
             work();
             return f->dst.at<uint8_t>(3, 5) ==
-                   f->a.at<uint8_t>(3, 5) + static_cast<int>(f->b.at<float>(3, 5));
+                   f->a.at<uint8_t>(3, 5) + static_cast<int>(real->b.at<float>(3, 5));
         },
         work);
-    zelt_bench::register_copy(name, f->dst.total() * 3);
-    zelt_bench::register_peer(name, "add", [f] { cv::add(f->a, f->b, f->dst, cv::noArray(), CV_8U); });
+    zelt_bench::register_copy(name, pixels_of(size) * 3);
+    zelt_bench::register_peer(name, "add", [=] { cv::add(f->a, real->b, f->dst, cv::noArray(), CV_8U); });
 }
 
 void register_complex(int size)
 {
-    const auto f = std::make_shared<frames>();
-    *f = {random_frame<float>(size, 1, 2), random_frame<float>(size, 2, 2), cv::Mat(size, size, CV_32FC2)};
+    const lazy_frames f{size, frames_of<float, 2>};
     const std::string name = "Multiply/complex/" + std::to_string(size);
     const auto work = [f] {
         Arithmetic::combine(method::multiply, wrap, image_of<float>(f->a), image_of<float>(f->b),
@@ -188,7 +209,7 @@ void register_complex(int size)
             return r[0] == p[0] * q[0] - p[1] * q[1] && r[1] == p[1] * q[0] + p[0] * q[1];
         },
         work);
-    zelt_bench::register_copy(name, f->dst.total() * 12);
+    zelt_bench::register_copy(name, pixels_of(size) * 12);
     zelt_bench::register_peer(name, "mulSpectrums", [f] { cv::mulSpectrums(f->a, f->b, f->dst, 0); });
 }
 
