@@ -213,6 +213,10 @@ TEST(Scalars, OfLargeIntegersAreThoseOfAddingDoublesOneByOne)
         check_image<T>({3001, 9}, memory_layout::packed,
                        [&](int x, int y) { return (x / 1000 + y) % 2 != 0 ? low(x, y) : high(x, y); });
     });
+    // Long and narrow: the moments pass 2^53, the squares do not.
+    for (const size s : {size{2, 740001}, size{1480001, 1}})
+        check_image<uint16_t>(s, memory_layout::packed,
+                              [](int x, int y) { return static_cast<uint16_t>(65535 - (x + y) % 3); });
     check_image<uint16_t>({2003, 1600}, memory_layout::padded,
                           [](int x, int y) { return static_cast<uint16_t>(65535 - (x + y) % 3); });
     check_image<int16_t>({1403, 7001}, memory_layout::packed,
