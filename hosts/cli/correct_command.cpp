@@ -76,8 +76,8 @@ const command_registration registered(10, [](CLI::App& app) {
     CLI::App* command = app.add_subcommand("correct", "camera exposures, with dark and flat frames");
     auto o = std::make_shared<command_options>();
     command->add_option("RAW", o->job.exposures, "exposures; each page of a stack is one")->required();
-    command->add_option("--dark", o->job.darks, "dark frames, averaged")->type_name("FILE...")->required();
-    command->add_option("--flat", o->job.flats, "flat frames, averaged")->type_name("FILE...");
+    command->add_option("--dark", o->job.darks, "dark frames, averaged")->type_name("FILE")->required();
+    command->add_option("--flat", o->job.flats, "flat frames, averaged")->type_name("FILE");
     command->add_option("-o,--output", o->job.output, "a file, a folder, or a pattern: {} name, {n} number")
         ->type_name("OUT")
         ->required();
@@ -95,7 +95,7 @@ const command_registration registered(10, [](CLI::App& app) {
         ->capture_default_str();
     command->add_flag("--no-gain", o->no_gain, "only take the dark away");
     command->add_option("--short", o->job.shorts, "short exposures that stand in where RAW is saturated")
-        ->type_name("FILE...");
+        ->type_name("FILE");
     command->add_option("--ratio", o->job.ratio, "how many times longer RAW was exposed")
         ->check(CLI::PositiveNumber);
     command->add_option("--bits", o->job.reading.bits, "nominal depth of 16-bit files")
