@@ -6,6 +6,8 @@
 #include "support/failures.h"
 #include "support/foreign_image.h"
 
+#include <ctime>
+#include <limits>
 #include <thread>
 
 namespace Qor::Luxar::ZELT::Test {
@@ -53,6 +55,16 @@ protected:
     test_image<uint16_t> gain = random_image<uint16_t>(small, memory_layout::packed, 4);
     test_image<int16_t> dst{small, memory_layout::inset};
 };
+
+/// Row by row this took a quarter of a minute.
+TEST_F(FlatFielding, ManyRowsWithoutPixelsEndAtOnce)
+{
+    const image_layout tall{0, std::numeric_limits<int32_t>::max(), 16, U, 0, 2, 0};
+    const auto frame = com_ptr<foreign_image>::attach(new foreign_image(tall, src.data()));
+    const auto start = std::clock();
+    EXPECT_EQ(facet->Flatten(frame.get(), frame.get(), frame.get(), nullptr, 1), S_OK);
+    EXPECT_LT(std::clock() - start, 2 * CLOCKS_PER_SEC); // of the processor, however busy the machine is
+}
 
 TEST_F(FlatFielding, ComputesThenCommitsAndLetsGo)
 {

@@ -21,6 +21,7 @@ inline bool is_contiguous(const image& i) { return is_contiguous(i, storage_byte
 
 inline void run_rows(Thread::ThreadPool* pool, int32_t height, const row_job& job, row_function row)
 {
+    if (job.width <= 0) return; // however many rows
     Thread::run_parallel(pool, {0, height},
                          [&job, row](int32_t y, const Thread::ThreadInformation&) { row(job, y); });
 }
