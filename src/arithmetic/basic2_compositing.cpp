@@ -23,10 +23,6 @@ HRESULT CBasic2::Combine(IPixmat2*, IPixmat2*, IPixmat2*, IPixmat2*, IPixmat2**)
     return E_NOTIMPL;
 }
 
-HRESULT CBasic2::Exp(IPixmat2*, IPixmat2*, IPixmat2**) noexcept { return E_NOTIMPL; }
-
-HRESULT CBasic2::Log(IPixmat2*, IPixmat2*, IPixmat2**) noexcept { return E_NOTIMPL; }
-
 HRESULT CBasic2::Modulate(IPixmat2*, IPixmat2*, double, IPixmat2*, IPixmat2**) noexcept { return E_NOTIMPL; }
 
 HRESULT CBasic2::Extend(IPixmat2*, IRectangle*, ZELT_BoundaryCondition, double, IPixmat2*,
@@ -34,8 +30,6 @@ HRESULT CBasic2::Extend(IPixmat2*, IRectangle*, ZELT_BoundaryCondition, double, 
 {
     return E_NOTIMPL;
 }
-
-HRESULT CBasic2::Power(IPixmat2*, double, IPixmat2*, IPixmat2**) noexcept { return E_NOTIMPL; }
 
 HRESULT CBasic::AddOffset(IPixmat2*, IPixmat2*, ICoordinateFloat*, ZELT_Offset) noexcept { return E_NOTIMPL; }
 
