@@ -12,15 +12,6 @@ enum ZELT_Offset : int32_t {
     ZELT_Offset_SubPixel = 1, ///< between pixels
 };
 
-/// What Extend puts where the image has no pixel. Only the first is there.
-enum ZELT_BoundaryCondition : int32_t {
-    ZELT_BoundaryCondition_ConstantValue = 0,
-    ZELT_BoundaryCondition_RepeatBorderPixels = 1,
-    ZELT_BoundaryCondition_Reflective = 2,
-    ZELT_BoundaryCondition_Periodic = 3,
-    ZELT_BoundaryCondition_Taper = 4,
-};
-
 enum ZELT_AutoThreshold_Method : int32_t {
     ZELT_AutoThreshold_Basic_Global = 0,
 };
@@ -210,16 +201,6 @@ struct enumeration_of<Luxar::ZELT::ZELT_Offset> {
         {"ZELT_Offset_SubPixel", 1},
     };
     static constexpr enumeration_info info{"ZELT_Offset", values};
-};
-
-template <>
-struct enumeration_of<Luxar::ZELT::ZELT_BoundaryCondition> {
-    static constexpr enumeration_value values[] = {
-        {"ZELT_BoundaryCondition_ConstantValue", 0}, {"ZELT_BoundaryCondition_RepeatBorderPixels", 1},
-        {"ZELT_BoundaryCondition_Reflective", 2},    {"ZELT_BoundaryCondition_Periodic", 3},
-        {"ZELT_BoundaryCondition_Taper", 4},
-    };
-    static constexpr enumeration_info info{"ZELT_BoundaryCondition", values};
 };
 
 template <>

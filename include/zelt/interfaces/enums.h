@@ -13,6 +13,16 @@ enum ZELT_Rounding : int32_t {
     ZELT_Rounding_Saturate = 3, ///< limited to the nominal range
 };
 
+/// What lies outside an image. IBasicOps2::Extend knows the first, the correlations of IFilters2 also know the
+/// periodic one.
+enum ZELT_BoundaryCondition : int32_t {
+    ZELT_BoundaryCondition_ConstantValue = 0,
+    ZELT_BoundaryCondition_RepeatBorderPixels = 1,
+    ZELT_BoundaryCondition_Reflective = 2,
+    ZELT_BoundaryCondition_Periodic = 3,
+    ZELT_BoundaryCondition_Taper = 4,
+};
+
 } // namespace Qor::Luxar::ZELT
 
 template <>
@@ -24,4 +34,14 @@ struct Qor::enumeration_of<Qor::Luxar::ZELT::ZELT_Rounding> {
         {"ZELT_Rounding_Saturate", 3},
     };
     static constexpr enumeration_info info{"ZELT_Rounding", values};
+};
+
+template <>
+struct Qor::enumeration_of<Qor::Luxar::ZELT::ZELT_BoundaryCondition> {
+    static constexpr enumeration_value values[] = {
+        {"ZELT_BoundaryCondition_ConstantValue", 0}, {"ZELT_BoundaryCondition_RepeatBorderPixels", 1},
+        {"ZELT_BoundaryCondition_Reflective", 2},    {"ZELT_BoundaryCondition_Periodic", 3},
+        {"ZELT_BoundaryCondition_Taper", 4},
+    };
+    static constexpr enumeration_info info{"ZELT_BoundaryCondition", values};
 };
