@@ -4,6 +4,8 @@
 #include "zelt/com/error_info.h"
 
 #include <mutex>
+#include <new>
+#include <typeinfo>
 
 namespace Qor {
 namespace {
@@ -50,11 +52,23 @@ HRESULT of_system(int32_t code)
 
 HResultException of_exception(const std::exception& e) { return with_text(E_FAIL, e); }
 HResultException of_argument(const std::exception& e) { return with_text(E_INVALIDARG, e); }
-HResultException of_memory(const std::exception& e) { return with_text(E_OUTOFMEMORY, e); }
+
+/// The standard library names its own exception differently from one to the next; clients see one text.
+HResultException of_memory(const std::bad_alloc& e)
+{
+    return at_least_the_code(E_OUTOFMEMORY, [&] {
+        return HResultException(E_OUTOFMEMORY,
+                                typeid(e) == typeid(std::bad_alloc) ? "bad allocation" : e.what());
+    });
+}
+
 HResultException of_system_error(const win32_error& e) { return with_text(of_system(e.code()), e); }
 HResultException of_code_error(const code_error& e) { return HResultException(e.code()); }
 HResultException of_code(const HRESULT& code) { return HResultException(code); }
-HResultException itself(const HResultException& e) { return e; }
+HResultException itself(const HResultException& e)
+{
+    return at_least_the_code(e.hresult, [&] { return e; });
+}
 
 template <class E, class Argument = E>
 using element = ExceptionTranslator<E, HResultException (*)(const Argument&)>;
@@ -68,7 +82,7 @@ struct chain {
     element<code_error> code_errors{of_code_error, codes};
     element<HResultException> translated{itself, code_errors};
     element<com_error> com_errors{from_error_object, translated};
-    element<std::bad_alloc, std::exception> memory{of_memory, com_errors};
+    element<std::bad_alloc> memory{of_memory, com_errors};
     element<std::out_of_range, std::exception> ranges{of_argument, memory};
     element<std::invalid_argument, std::exception> arguments{of_argument, ranges};
     element<std::bad_cast, std::exception> casts{of_argument, arguments};

@@ -1,6 +1,7 @@
 #include "frame/image_access.h"
 
 #include "frame/operation.h"
+#include "pixmat/descriptor.h"
 #include "zelt/com/class_registry.h"
 
 namespace Qor::Luxar::ZELT {
@@ -49,15 +50,7 @@ HRESULT ReadLayout(IPixmat2* image, image_layout* layout) noexcept
 
 HRESULT ReadLayout(IPixmatDescriptor* descriptor, image_layout* layout) noexcept
 {
-    if (!descriptor) return E_INVALIDARG;
-    HRESULT hr = descriptor->get_Width(&layout->width);
-    if (succeeded(hr)) hr = descriptor->get_Height(&layout->height);
-    if (succeeded(hr)) hr = descriptor->get_Bits(&layout->bits);
-    if (succeeded(hr)) hr = descriptor->get_Encoding(&layout->encoding);
-    if (succeeded(hr)) hr = descriptor->get_Offset(&layout->offset);
-    if (succeeded(hr)) hr = descriptor->get_XStride(&layout->x_stride);
-    if (succeeded(hr)) hr = descriptor->get_YStride(&layout->y_stride);
-    return hr;
+    return descriptor ? read_layout(descriptor, *layout) : E_INVALIDARG;
 }
 
 ImageReadAccess::ImageReadAccess(IPixmat2* image) : image_(image)

@@ -12,11 +12,12 @@ namespace Qor::Luxar::ZELT {
 HRESULT ReadLayout(IPixmat2* image, image_layout* layout) noexcept;
 HRESULT ReadLayout(IPixmatDescriptor* descriptor, image_layout* layout) noexcept;
 
-/// Joins a view to what keeps it valid. Lock goes first, then the image.
+/// Joins a view to what keeps it valid. Lock goes first, then the image. Moves, but has no copies.
 class ImageReadAccess {
 public:
     /// Throws std::invalid_argument "null IPixmat2", or HResultException for what the image answers.
     explicit ImageReadAccess(IPixmat2* image);
+    ImageReadAccess(ImageReadAccess&&) noexcept = default;
 
     const memory_2d& view() const noexcept { return view_; }
 
@@ -29,6 +30,7 @@ private:
 class ImageWriteAccess {
 public:
     explicit ImageWriteAccess(IPixmat2* image);
+    ImageWriteAccess(ImageWriteAccess&&) noexcept = default;
 
     const memory_2d& view() const noexcept { return view_; }
     IPixmat2* image() const noexcept { return image_.get(); }

@@ -11,4 +11,10 @@ HRESULT detail::run_frame(const GUID& interface_id, HRESULT (*body)(void*), void
     }
 }
 
+com_ptr<IPixmat2> committed(ImageWriteAccess& dst)
+{
+    CheckHResult(dst.Commit());
+    return com_ptr<IPixmat2>(dst.image());
+}
+
 } // namespace Qor::Luxar::ZELT

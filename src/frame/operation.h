@@ -20,17 +20,22 @@ HRESULT run_frame(const GUID& interface_id, Body&& body) noexcept
         &body);
 }
 
-/// A method whose result is an image. The body resolves the output, then the inputs, runs its kernel and returns the
-/// output's access. Committed and handed out with a reference added; a null result pointer is E_POINTER, but only after
+/// Ends the body of an image_method: the result is complete. Committed here, before the body's scope ends, because a
+/// commit comes before the release of any lock, those of the inputs included.
+com_ptr<IPixmat2> committed(ImageWriteAccess& dst);
+
+/// A method whose result is an image. The body resolves the output, then the inputs, runs its kernel and returns
+/// committed(output). The image is handed out with a reference added; a null result pointer is E_POINTER, but only after
 /// the work is done.
 template <class Interface, class Body>
 HRESULT image_method(IPixmat2** result, Body&& body) noexcept
 {
+    static_assert(std::is_same_v<decltype(body()), com_ptr<IPixmat2>>,
+                  "the body ends with: return committed(dst);");
     return run_frame(Interface::iid, [&]() -> HRESULT {
-        ImageWriteAccess dst = body();
-        CheckHResult(dst.Commit());
+        com_ptr<IPixmat2> image = body();
         if (!result) return E_POINTER;
-        com_ptr<IPixmat2>(dst.image()).copy_to(result);
+        *result = image.detach();
         return S_OK;
     });
 }

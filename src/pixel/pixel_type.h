@@ -64,12 +64,13 @@ constexpr bool is_half_complex(PixmatEncoding encoding) noexcept
            encoding == PixmatEncoding_Complex_Float_Half_Odd;
 }
 
-/// The width of the image that a layout stands for: 2w - 2 and 2w - 1 for half-complex, else w.
+/// The width of the image that a layout stands for: 2w - 2 and 2w - 1 for half-complex, else w. One beyond 32 bits keeps
+/// its low bits and is negative then; the image factory refuses it.
 constexpr int32_t full_width(const image_layout& layout) noexcept
 {
-    if (layout.encoding == PixmatEncoding_Complex_Float_Half_Even) return 2 * layout.width - 2;
-    if (layout.encoding == PixmatEncoding_Complex_Float_Half_Odd) return 2 * layout.width - 1;
-    return layout.width;
+    if (!is_half_complex(layout.encoding)) return layout.width;
+    const int missing = layout.encoding == PixmatEncoding_Complex_Float_Half_Even ? 2 : 1;
+    return static_cast<int32_t>(2 * int64_t{layout.width} - missing);
 }
 
 constexpr bool is_well_formed(const rectangle& r) noexcept { return r.left <= r.right && r.top <= r.bottom; }

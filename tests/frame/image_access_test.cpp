@@ -1,5 +1,6 @@
 #include "frame/image_access.h"
 
+#include "frame/event_sink.h"
 #include "frame/operation.h"
 #include "support/cases.h"
 #include "support/failures.h"
@@ -61,6 +62,20 @@ TEST(ImageAccess, FailuresOfTheImageAreItsOwnCodes)
                                          "Unsupported Pixmat encoding/bits");
 }
 
+TEST(ImageAccess, HasOneOwner)
+{
+    static_assert(!std::is_copy_constructible_v<ImageReadAccess> &&
+                  !std::is_copy_constructible_v<ImageWriteAccess>);
+    uint8_t pixel[1] = {};
+    const auto image = make<foreign_image>(packed_layout(1, 1, 8, PixmatEncoding_Unsigned), pixel);
+    {
+        ImageReadAccess first(image.get());
+        const ImageReadAccess second(std::move(first));
+        EXPECT_EQ(second.view().data, pixel);
+    }
+    EXPECT_EQ(image->calls, (std::vector<std::string>{"read", "release read"}));
+}
+
 TEST(ImageAccess, MethodCommitsBeforeItReleasesAndOnlyOnSuccess)
 {
     uint8_t pixel[1] = {};
@@ -71,13 +86,13 @@ TEST(ImageAccess, MethodCommitsBeforeItReleasesAndOnlyOnSuccess)
             auto dst = ResolveOutput(image.get(), image.get());
             ImageReadAccess src(image.get());
             if (fail) throw std::invalid_argument("no");
-            return dst;
+            return committed(dst);
         });
     };
     EXPECT_EQ(body(false), S_OK);
     EXPECT_TRUE(same_object(result.get(), image.get()));
     EXPECT_EQ(image->calls,
-              (std::vector<std::string>{"write", "read", "release read", "commit", "release write"}));
+              (std::vector<std::string>{"write", "read", "commit", "release read", "release write"}));
     image->calls.clear();
     EXPECT_EQ(body(true), E_INVALIDARG);
     EXPECT_FALSE(result);
@@ -90,7 +105,7 @@ TEST(ImageAccess, NullResultIsAnErrorOnlyAfterTheWork)
     const HRESULT hr = image_method<IPixmat2>(nullptr, [&] {
         auto dst = ResolveOutput(nullptr, out.get());
         dst.view().data[0] = 7;
-        return dst;
+        return committed(dst);
     });
     EXPECT_EQ(hr, E_POINTER);
     EXPECT_EQ(ImageReadAccess(out.get()).view().data[0], 7);
@@ -139,6 +154,33 @@ TEST(ImageAccess, DescriptorOfAnotherSizeHasItsOwnCode)
     EXPECT_EQ(CreateFromDescriptor(input.get(), nullptr, out.put()), S_OK);
     EXPECT_EQ(layout_of(out.get()), layout_of(input.get()));
     EXPECT_EQ(CreateFromDescriptor(nullptr, nullptr, out.put()), E_INVALIDARG);
+}
+
+TEST(EventSink, ForwardsToItsObserver)
+{
+    struct recorder final : CPixmatEventSink::Observer {
+        IPixmat2* image = nullptr;
+        const rectangle* changed = nullptr;
+        HRESULT OnPixmatChanged(IPixmat2* i, const rectangle* r) noexcept override
+        {
+            image = i;
+            changed = r;
+            return E_ACCESSDENIED;
+        }
+    } observer;
+    const auto sink = make<CPixmatEventSink>();
+    const com_ptr<IPixmat2> image = new_image(packed_layout(4, 3, 8, PixmatEncoding_Unsigned));
+    const rectangle part{1, 1, 2, 2};
+    EXPECT_EQ(sink->OnPixmatChanged(image.get(), &part), S_OK) << "to nobody";
+    sink->SetObserver(&observer);
+    EXPECT_EQ(sink->OnPixmatChanged(nullptr, &part), E_ACCESSDENIED);
+    EXPECT_EQ(observer.changed, &part);
+    ASSERT_EQ(image->StartNotifications(sink.get(), PixmatEventMode_AfterCommit), S_OK);
+    EXPECT_EQ(ImageWriteAccess(image.get()).Commit(), S_OK);
+    EXPECT_EQ(observer.image, image.get());
+    EXPECT_EQ(observer.changed, nullptr);
+    sink->SetObserver(nullptr);
+    EXPECT_EQ(sink->OnPixmatChanged(image.get(), &part), S_OK) << "to nobody again";
 }
 
 TEST(ImageAccess, UnknownClassNamesItself)

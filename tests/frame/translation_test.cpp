@@ -44,7 +44,7 @@ TEST(Translation, GivesEachExceptionItsCodeAndText)
         {"cast", [] { throw std::bad_cast(); }, 0x80070057, L"std::bad_cast"},
         {"argument", [] { throw std::invalid_argument("null IPixmat2"); }, 0x80070057, L"null IPixmat2"},
         {"range", [] { throw std::out_of_range("far"); }, 0x80070057, L"far"},
-        {"memory", [] { throw std::bad_alloc(); }, 0x8007000E, L"std::bad_alloc"},
+        {"memory", [] { throw std::bad_alloc(); }, 0x8007000E, L"bad allocation"},
         {"object", [&] { throw com_error(E_ACCESSDENIED, object); }, 0x80070005, L"from the object"},
         {"no object", [] { throw com_error(E_ACCESSDENIED); }, 0x80070005, L""},
         {"result", [] { throw HResultException(E_POINTER, "text"); }, 0x80004003, L"text"},
@@ -113,18 +113,25 @@ TEST(Translation, CheckKeepsGivenTextsAndFillsTheRest)
 
 TEST(Translation, KeepsTheCodeWhenNoTextCanBeMade)
 {
-    const std::invalid_argument failure("a text too long for a string to keep inside itself");
-    for (int n = 1;; ++n) {
-        bool reached = false;
-        const HRESULT hr = [&] {
+    const std::string text = "a text too long for a string to keep inside itself";
+    const struct {
+        std::exception_ptr failure; // made before memory runs out
+        HRESULT code;
+    } cases[] = {
+        {std::make_exception_ptr(std::invalid_argument(text)), E_INVALIDARG},
+        {std::make_exception_ptr(HResultException(E_ACCESSDENIED, text)), E_ACCESSDENIED},
+        {std::make_exception_ptr(std::bad_alloc()), E_OUTOFMEMORY},
+    };
+    for (const auto& c : cases) {
+        bool reached = true;
+        for (int n = 1; reached; ++n) {
+            ASSERT_LT(n, 100);
             const failing_allocation armed(n);
-            const HRESULT answer = run_frame(IPixmat2::iid, [&]() -> HRESULT { throw failure; });
+            const HRESULT hr =
+                run_frame(IPixmat2::iid, [&]() -> HRESULT { std::rethrow_exception(c.failure); });
             reached = armed.happened();
-            return answer;
-        }();
-        EXPECT_TRUE(hr == E_INVALIDARG || (reached && hr == E_OUTOFMEMORY)) << "allocation " << n;
-        if (!reached) break;
-        ASSERT_LT(n, 100);
+            EXPECT_EQ(hr, c.code) << "allocation " << n;
+        }
     }
 }
 

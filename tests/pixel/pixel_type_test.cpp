@@ -119,6 +119,9 @@ TEST(PixelType, HalfComplexStandsForAFullWidth)
             EXPECT_EQ(full_width(layout), full) << "encoding " << encoding << ", width " << width;
             EXPECT_EQ(is_half_complex(layout.encoding), encoding == 12 || encoding == 17);
         }
+    // Evaluated by the compiler, which takes no overflow.
+    constexpr image_layout widest{INT32_MAX, 1, 64, PixmatEncoding_Complex_Float_Half_Odd, 0, 8, 8};
+    static_assert(full_width(widest) == -3);
 }
 
 TEST(PixelType, StandardSwitchTakesTheEightRealTypes)
