@@ -84,6 +84,8 @@ public:
         if (!given || is_missing(*given)) {
             // A VARIANT operand that was passed as missing is handed on as it is.
             if (given && a.type == VT_VARIANT) return VariantCopyInd(&slots_[i], given);
+            if (given && !a.optional && is_lenient_image(a))
+                return E_INVALIDARG; // it came, but not as an object
             return place_default(i, a);
         }
         if (a.interface_id) return place_object(i, a, *given);
@@ -117,6 +119,11 @@ public:
     }
 
 private:
+    bool is_lenient_image(const argument_info& a) const noexcept
+    {
+        return lenient_ && std::string_view(a.type_name) == "IPixmat2";
+    }
+
     static HRESULT place_out(const argument_info& a, const VARIANT* given) noexcept
     {
         const bool usable = !given || is_missing(*given) || ((given->vt & VT_BYREF) && given->byref);
@@ -141,7 +148,7 @@ private:
 
     HRESULT place_object(size_t i, const argument_info& a, const VARIANT& given) noexcept
     {
-        const bool image = lenient_ && std::string_view(a.type_name) == "IPixmat2";
+        const bool image = is_lenient_image(a);
         IUnknown* object = nullptr;
         if (!get_object(given, &object)) return image ? E_INVALIDARG : DISP_E_TYPEMISMATCH;
         slots_[i].vt = VT_UNKNOWN;

@@ -191,7 +191,8 @@ TEST(Dispatch, RefusesWhatDoesNotFit)
         {"text for a number", {image.get(), L"seven"}, DISP_E_TYPEMISMATCH},
         {"too large", {image.get(), 3e9}, DISP_E_OVERFLOW},
         {"missing", {image.get()}, DISP_E_PARAMNOTOPTIONAL},
-        {"missing in place", {missing(), 1}, DISP_E_PARAMNOTOPTIONAL},
+        {"missing for an image", {missing(), 1}, E_INVALIDARG},
+        {"missing for a number", {image.get(), missing()}, DISP_E_PARAMNOTOPTIONAL},
     };
     for (const auto& c : cases) {
         object->n = -1;
