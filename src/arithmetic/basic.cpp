@@ -9,19 +9,25 @@ namespace {
 
 using second_method = HRESULT (CBasic2::*)(IPixmat2*, VARIANT, IPixmat2*, IPixmat2**) noexcept;
 
-/// A mode other than 0 holds on the facet as long as this lives.
+/// A mode other than 0 holds on the facet as long as this lives. Without one the facet is not written, so that such
+/// calls may run at once.
 class rounding_override {
 public:
-    rounding_override(ZeltRoundable& facet, ZELT_Rounding r) noexcept : facet_(facet), before_(facet.get())
+    rounding_override(ZeltRoundable& facet, ZELT_Rounding r) noexcept
+        : facet_(facet), overrides_(r != ZELT_Rounding_Default), before_(facet.get())
     {
-        if (r != ZELT_Rounding_Default) facet_.set(r);
+        if (overrides_) facet_.set(r);
     }
-    ~rounding_override() { facet_.set(before_); }
+    ~rounding_override()
+    {
+        if (overrides_) facet_.set(before_);
+    }
     rounding_override(const rounding_override&) = delete;
     rounding_override& operator=(const rounding_override&) = delete;
 
 private:
     ZeltRoundable& facet_;
+    bool overrides_;
     ZELT_Rounding before_;
 };
 

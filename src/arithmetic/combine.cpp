@@ -104,9 +104,10 @@ HRESULT read_number(const second_operand& b, bool for_complex, number* n) noexce
     return for_complex && read_array(b.value, n) ? S_OK : E_INVALIDARG;
 }
 
-/// The full image of a half-complex one, as first operand and output.
-HRESULT expand(IPixmat2* half, const image_layout& layout, image_layout* full_layout, com_ptr<IPixmat2>* out)
+/// The full image of a half-complex part, as first operand and output.
+HRESULT expand(IPixmat2* half, const image_part& part, image_layout* full_layout, com_ptr<IPixmat2>* out)
 {
+    const image_layout& layout = part.layout;
     if (layout.bits != 64 && layout.bits != 128) return E_INVALIDARG;
     const image_layout wanted =
         packed_layout(full_width(layout), layout.height, layout.bits, PixmatEncoding_Complex_Float);
@@ -115,7 +116,7 @@ HRESULT expand(IPixmat2* half, const image_layout& layout, image_layout* full_la
     com_ptr<IPixmatLock> read, write;
     if (const HRESULT hr = full->OpenWrite(write.put()); failed(hr)) return hr;
     if (const HRESULT hr = half->OpenRead(nullptr, 1.0, read.put()); failed(hr)) return hr;
-    ExpandHalfComplex(view_of(layout, read->Data(0)), view_of(wanted, write->Data(0)));
+    ExpandHalfComplex(view_of(layout, read->Data(0) + part.first), view_of(wanted, write->Data(0)));
     *full_layout = wanted;
     *out = std::move(full);
     return S_OK;
@@ -147,8 +148,7 @@ HRESULT combine(method m, ZELT_Rounding mode, IPixmat2* pIA, const VARIANT& b, I
         return refuse(L"Half-complex image must be first operand", E_NOTIMPL);
     com_ptr<IPixmat2> first(pIA), out(pIOutImg);
     if (first_is_half && (second.image ? !second_is_half : second.is_complex_number())) {
-        image_layout half = first_pixels.layout;
-        half.offset = static_cast<int32_t>(half.offset + shift);
+        const image_part half{first_pixels.layout, shift};
         if (const HRESULT hr = expand(pIA, half, &first_pixels.layout, &first); failed(hr)) return hr;
         out = first;
         shift = 0;

@@ -147,8 +147,10 @@ HRESULT CFlatFielding::FlattenDouble(IPixmat2* pIDstImage, IPixmat2* pISrcImageL
                                    pIGainRefImage};
         image_layout layouts[std::size(given)];
         const auto layout_of = [&](size_t i) { return given[i] ? &layouts[i] : nullptr; };
-        for (size_t i = 0; i < std::size(given); ++i)
+        for (size_t i = 0; i < std::size(given); ++i) {
             if (const HRESULT hr = given[i] ? ReadLayout(given[i], &layouts[i]) : S_OK; failed(hr)) return hr;
+            if (i == 0) FlatField::check_merge_destination(layouts[0]);
+        }
         FlatField::check_merge({layout_of(0), layout_of(1), layout_of(2), layout_of(3), layout_of(4)});
         return S_OK;
     });

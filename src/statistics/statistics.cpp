@@ -47,9 +47,13 @@ HRESULT position_method(IPixmat2* image, IRectangle* area, statistic_flag x_flag
     });
 }
 
+/// A stored position may be any number: its low bits, 0 for NaN and what lies beyond 64 bits.
 HRESULT make_nearest(double x, double y, ICoordinateInt** out) noexcept
 {
-    const auto nearest = [](double v) { return static_cast<LONG>(std::floor(v + 0.5)); };
+    const auto nearest = [](double v) {
+        const double whole = std::floor(v + 0.5);
+        return whole >= -0x1p63 && whole < 0x1p63 ? static_cast<LONG>(static_cast<int64_t>(whole)) : LONG{0};
+    };
     return Common::MakeCoordinateInt(nearest(x), nearest(y), out);
 }
 

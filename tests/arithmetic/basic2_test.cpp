@@ -413,6 +413,21 @@ TEST_F(Basic2, SetsWholeImagesAndRectangles)
     EXPECT_TRUE(same_bits(pixel_of<complex_pixel<float>>(c), {1, 2}));
 }
 
+/// Expanding drops the output, so nothing comes of it; the part is still read where it lies, at any offset.
+TEST_F(Basic2, SetToOfSpectraWithComplexNumbersHasNoEffect)
+{
+    test_image<complex_pixel<float>> pixels({6, 2}, memory_layout::packed, pixel_type::half_even_32);
+    auto layout = pixels.layout();
+    const int64_t away = int64_t{INT32_MAX} - layout.offset;
+    layout.offset = INT32_MAX;
+    const auto half = make<foreign_image>(layout, static_cast<uint8_t*>(pixels.data()) - away);
+    com_ptr<IRectangle> area;
+    ASSERT_EQ(Common::MakeRectangle(2, 1, 5, 2, area.put()), S_OK);
+    EXPECT_EQ(facet->SetTo(half.get(), *complex_object(1, 2).get(), area.get()), S_OK);
+    EXPECT_EQ(half->calls, (calls{"read", "release read"}));
+    expect_equal(pixels, [](int, int) { return complex_pixel<float>{}; });
+}
+
 TEST_F(Basic2, SetToRefusesRectanglesAndSizes)
 {
     const auto a = image<uint8_t>(U, 1), little = image<uint8_t>(U, 2, {3, 3});

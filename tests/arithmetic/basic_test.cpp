@@ -2,6 +2,7 @@
 
 #include "frame/image_access.h"
 #include "support/failures.h"
+#include "support/foreign_image.h"
 #include "zelt/interfaces/zelt.h"
 
 namespace Qor::Luxar::ZELT::Test {
@@ -95,6 +96,25 @@ TEST_F(Basic, OverridesTheFacetsRoundingForOneCall)
     EXPECT_EQ(facet->Add(a.get(), *second.get(), static_cast<ZELT_Rounding>(4)), E_UNEXPECTED);
     EXPECT_EQ(object->roundable().get(), ZELT_Rounding_Saturate) << "restored after a failure";
     EXPECT_EQ(pixel_of(a), 200);
+}
+
+/// The mode is set while such a call works, by another thread say: it must not be taken back.
+TEST_F(Basic, LeavesTheFacetsRoundingAloneWithoutAnOverride)
+{
+    struct meddling_image final : foreign_image {
+        using foreign_image::foreign_image;
+        HRESULT OpenWrite(IPixmatLock** out) noexcept override
+        {
+            facet->roundable().set(ZELT_Rounding_Saturate);
+            return foreign_image::OpenWrite(out);
+        }
+        CBasic* facet = nullptr;
+    };
+    uint8_t pixels[6] = {};
+    const auto a = make<meddling_image>(packed_layout(3, 2, 8, U), pixels);
+    a->facet = object.get();
+    ASSERT_EQ(facet->Add(a.get(), *second.get(), ZELT_Rounding_Default), S_OK);
+    EXPECT_EQ(object->roundable().get(), ZELT_Rounding_Saturate);
 }
 
 TEST_F(Basic, MakesTheImageOfTheDescriptor)

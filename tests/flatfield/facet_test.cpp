@@ -209,6 +209,8 @@ TEST_F(FlatFielding, RefusesWrongExposuresWithItsTextBeforeAnyLock)
             f.get());
     refuses(L"Gain reference provided without dark reference", d.get(), s.get(), nullptr, nullptr, f.get());
     for (const auto& i : {s, r, d, f}) EXPECT_EQ(i->calls, calls{});
+    const auto unreadable = object(src, failing::descriptor);
+    refuses(L"Destination image must be signed", s.get(), unreadable.get(), nullptr, nullptr, nullptr);
 }
 
 TEST_F(FlatFielding, MakesNewImagesWithTheInputsDescriptor)

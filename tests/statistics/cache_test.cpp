@@ -145,6 +145,9 @@ TEST(ScalarCache, AnswersFromTheStoreOnlyForTheWholeImage)
         EXPECT_NE(ask(s.get(), q.method, image.get(), box(0, 0, 3, 1).get()), 42.5) << narrow(q.key);
     }
     EXPECT_EQ(position(s.get(), &IStatistics::MinimumPosition, image.get()), (coordinate<int32_t>{2, 1}));
+    plant(image.get(), L"stats:maxposx", variant(std::nan("")));
+    plant(image.get(), L"stats:maxposy", variant(0x1p40 + 3));
+    EXPECT_EQ(position(s.get(), &IStatistics::MaximumPosition, image.get()), (coordinate<int32_t>{0, 3}));
     EXPECT_EQ(stored(image.get(), L"stats:minimum").type(), VT_BSTR) << "an area must not write";
 
     plant(image.get(), L"stats:minimum", variant(L"no number"));

@@ -64,9 +64,14 @@ bool in_lanes(const exposures& e, int32_t scale_factor)
 
 } // namespace
 
+void check_merge_destination(const image_layout& dst)
+{
+    require(dst.encoding == PixmatEncoding_Signed, "Destination image must be signed");
+}
+
 void check_merge(const merge_layouts& m)
 {
-    require(m.dst->encoding == PixmatEncoding_Signed, "Destination image must be signed");
+    check_merge_destination(*m.dst);
     require(m.long_exposure->encoding == PixmatEncoding_Unsigned && m.long_exposure->bits <= 16,
             "Source image must be unsigned 16 max");
     if (m.dark)

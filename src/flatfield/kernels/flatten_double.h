@@ -15,7 +15,9 @@ struct merge_layouts {
     const image_layout* gain;
 };
 
-/// Throws std::invalid_argument with the texts of IFlatFielding::FlattenDouble, in their order.
+/// Throws std::invalid_argument with the texts of IFlatFielding::FlattenDouble, in their order. The destination comes
+/// before anything else is looked at.
+void check_merge_destination(const image_layout& dst);
 void check_merge(const merge_layouts& layouts);
 
 /// What check_merge has accepted; the short exposure, the dark reference and the gain may be absent. ratio:
