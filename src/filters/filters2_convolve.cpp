@@ -50,7 +50,7 @@ HRESULT gradient(IPixmat2* image, IPixmat2* out, IPixmat2** result, Kernel&& ker
         auto dst = ResolveOutput(image, out);
         const ImageReadAccess src(image);
         kernel(src.view(), dst.view());
-        return dst;
+        return committed(dst);
     });
 }
 
@@ -66,7 +66,7 @@ HRESULT CFilters2::Convolve(IPixmat2* pIImage, VARIANT kernel, LONG kx, LONG ky,
         const ImageReadAccess src(pIImage);
         const kernel_access values(kernel.parray);
         Filters::convolve(src.view(), values.view(), {kx, ky}, dst.view(), &pool());
-        return dst;
+        return committed(dst);
     });
 }
 
