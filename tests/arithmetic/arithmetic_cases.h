@@ -119,6 +119,16 @@ public:
                     std::memcpy(memory_.at(x, y), &v, sizeof v);
                 });
     }
+    /// Sets every pixel to f(x, y), which has the storage type.
+    template <class F>
+    void set(F&& f)
+    {
+        for (int y = 0; y < size_.height; ++y)
+            for (int x = 0; x < size_.width; ++x) {
+                const auto v = f(x, y);
+                std::memcpy(memory_.at(x, y), &v, sizeof v);
+            }
+    }
     void replace_zeros()
     {
         for (int y = 0; y < size_.height; ++y)

@@ -92,8 +92,35 @@ struct IBasicOps2 : IDispatch {
     /// Fails      E_POINTER for a null image; E_INVALIDARG for a rectangle that leaves it; then as above.
     virtual HRESULT SetTo(IPixmat2* pIImg, VARIANT b, IRectangle* pIRect) noexcept = 0;
 
+    // What holds for AddOffset to Extend below: "real" means Unsigned and Signed of 8 to 32 bits and Float 32 and 64. A
+    // double becomes an integer by truncation; one that leaves the type keeps its low bits, and NaN or what lies
+    // beyond 64 bits is 0. Images that share memory in part give what separate ones would. A text goes with
+    // E_INVALIDARG unless another code is told; a code without text stands alone. What an image answers comes back
+    // unchanged. Everything runs on the calling thread.
+
+    /// Blends pIB into pIA at a position between pixels.
+    /// Pixels     both real, of any two types, or both RGB or both BGR of 24 bits, each byte on its own.
+    /// Arguments  pIPos: where the origin of pIB falls in pIA, in pixels. fa, fb: weights of pIA and pIB.
+    /// Values     fa * pIA + fb * (sum of the neighbours in pIB, each with its bilinear weight), in double:
+    ///            first the pixel itself, then its left neighbour, then the two above. What lies outside pIB adds nothing, so that its
+    ///            rim fades. Pixels of pIA that no neighbour of any weight touches stay as they are: at a whole
+    ///            position these are all but those below pIB.
+    /// In place   always; pIB may be pIA.
+    /// NaN        a position that is NaN, infinite or so far away that nothing meets changes nothing and succeeds.
+    /// Fails      E_INVALIDARG for a null argument; E_NOTIMPL for other pixels.
     virtual HRESULT AddOffset(IPixmat2* pIA, IPixmat2* pIB, ICoordinateFloat* pIPos, double fa,
                               double fb) noexcept = 0;
+    /// The weighted sum of two images, with pIB at a whole position.
+    /// Pixels     real, of any two types. A new output has the descriptor of pIA, nominal bits included; a given one
+    ///            has the size and storage of pIA.
+    /// Arguments  pIPos: where the origin of pIB falls in pIA; null means (0, 0). ppIOut: may be null if pIOut is
+    ///            given.
+    /// Values     fa * pIA, and + fb * (ratio * pIB) where pIB lies, in double. ratio: between integers the ratio
+    ///            of their nominal ranges, 65536 / 256 for pIA of 16 bits and pIB of 8; else 1.
+    /// In place   the output may be either operand.
+    /// Fails      in this order: E_POINTER for no pIOut and no ppIOut; E_INVALIDARG for a null image;
+    ///            "AddIntegerOffset: Source and destination image must be equal in size"; E_NOTIMPL for other pixels;
+    ///            E_INVALIDARG for an output of another storage.
     virtual HRESULT AddIntegerOffset(IPixmat2* pIA, IPixmat2* pIB, ICoordinateInt* pIPos, double fa,
                                      double fb, IPixmat2* pIOut, IPixmat2** ppIOut) noexcept = 0;
 
@@ -107,18 +134,66 @@ struct IBasicOps2 : IDispatch {
                               VARIANT highValue, IPixmat2* pIOutImg, IPixmat2** ppIOut) noexcept = 0;
     virtual HRESULT Normalize(IPixmat2* pIImage, double low, double high, IPixmat2* pIOutImg,
                               IPixmat2** ppIOut) noexcept = 0;
+    /// Whether two images have the same pixels. Images of different size, encoding or bits are not equal; strides may
+    /// differ.
+    /// Pixels     Unsigned, Signed (by their stored bytes), Float and complex of any kind (by value, so that NaN
+    ///            differs from itself and 0 equals -0); RGB, RGBA and BGR of 24 or 32 bits, all bytes.
+    /// Values     VARIANT_TRUE or VARIANT_FALSE. Images without pixels are equal.
+    /// Fails      E_INVALIDARG for a null image; E_POINTER for a null pResult; E_NOTIMPL for images of one format with
+    ///            other pixels: integers below 8 bits or of 64, BGRA, anything else.
     virtual HRESULT Equals(IPixmat2* pIImgA, IPixmat2* pIImgB, VARIANT_BOOL* pResult) noexcept = 0;
     virtual HRESULT AutoThreshold(IPixmat2* pIImage, VARIANT belowValue, VARIANT aboveValue,
                                   ZELT_AutoThreshold_Method method, IPixmat2* pIOutImg,
                                   IPixmat2** ppIOut) noexcept = 0;
+    /// Blanks a frame around an image.
+    /// Pixels     real. A new output has the descriptor of pIImage; a given one has its size and storage.
+    /// Arguments  imgMargins: width of the frame in pixels on the right and at the bottom; on the left and at the top
+    ///            it is one more, deliberately. A negative number makes no frame.
+    /// Values     the frame gets the lowest value of the type: 0 for Unsigned, -32768 for Signed of 16 bits; for Float
+    ///            the least positive normal number.
+    /// In place   allowed.
+    /// Fails      in this order: E_INVALIDARG for a null image or an output of another size; E_NOTIMPL for other
+    ///            pixels; E_INVALIDARG for an output of another storage. E_POINTER, after the work, for a null ppIOut.
     virtual HRESULT Margins(IPixmat2* pIImage, LONG imgMargins, IPixmat2* pIOutImg,
                             IPixmat2** ppIOut) noexcept = 0;
+    /// Blends two images by a mask: base * (1 - w) + combine * w, in double.
+    /// Pixels     real; all images have one size, encoding and bits. A new output has the descriptor of pIBaseImage.
+    /// Values     w is the mask mapped to 0 to 1 over the range of its storage (not that of its nominal bits): p
+    ///            times the reciprocal of the highest value of an Unsigned type, p minus the lowest value times the
+    ///            reciprocal of the range of a Signed one. For Signed of 16 bits that reciprocal is
+    ///            1.5259021896692422e-5, so that the highest weight falls just short of 1. Float is its own weight,
+    ///            also outside 0 to 1.
+    /// In place   the output may be any of the inputs.
+    /// Fails      in this order: E_INVALIDARG for a null image; "all input images must be of the same format";
+    ///            "input and output images must be of the same format"; E_NOTIMPL for other pixels.
+    ///            E_POINTER, after the work, for a null ppIOut.
     virtual HRESULT Combine(IPixmat2* pIBaseImage, IPixmat2* pICombineImage, IPixmat2* pIWeightMask,
                             IPixmat2* pIOutImg, IPixmat2** ppIOut) noexcept = 0;
     virtual HRESULT Exp(IPixmat2* pIImage, IPixmat2* pIOutImg, IPixmat2** ppIOut) noexcept = 0;
     virtual HRESULT Log(IPixmat2* pIImage, IPixmat2* pIOutImg, IPixmat2** ppIOut) noexcept = 0;
+    /// Shades a colour image by a mask.
+    /// Pixels     pIImage: RGB, RGBA or BGR of 24 or 32 bits; pIMask: real, of the same size. The output has the format
+    ///            of pIImage, a new one its descriptor.
+    /// Arguments  weight: how much the mask counts; 0 leaves the colours, 1 puts the mask in their place.
+    /// Values     pow(c / 255, 1 - weight) * 255 * pow(m, weight) for each colour byte c, truncated, with m the mask
+    ///            mapped to 0 to 1 as in Combine. A fourth byte is not written.
+    /// In place   allowed.
+    /// Fails      in this order: E_INVALIDARG for a null image; E_NOTIMPL "Source image must have color encoding";
+    ///            "Image and mask must have the same size"; "input and output images must be of the same format";
+    ///            E_NOTIMPL for other pixels. E_POINTER, after the work, for a null ppIOut.
     virtual HRESULT Modulate(IPixmat2* pIImage, IPixmat2* pIMask, double weight, IPixmat2* pIOutImage,
                              IPixmat2** ppIOut) noexcept = 0;
+    /// Cuts an image to a rectangle that may reach beyond it, and pads it there.
+    /// Pixels     real, integers of 9 to 16 bits among them but none of 17 to 31. A new output declares the bits of its
+    ///            storage; a given one has the pixel type of pIImage.
+    /// Arguments  pIExtendedImageDomain: the part of the plane that the output shows, in pixels of pIImage; a left
+    ///            of -2 pads two pixels there. boundaryCondition: only ZELT_BoundaryCondition_ConstantValue is there.
+    ///            padValue: truncated to the pixel type.
+    /// In place   allowed.
+    /// Fails      in this order: E_NOTIMPL for another boundary condition; E_INVALIDARG for a null rectangle or one
+    ///            with negative sides; E_OUTOFMEMORY for a new output too large for memory; E_INVALIDARG, as told:
+    ///            "null IPixmat2"; "Extend: src and dst pixel types must be identical"; "Extend: dst size mismatch";
+    ///            "Extend: unsupported pixel type". E_POINTER, after the work, for a null ppIPixmat.
     virtual HRESULT Extend(IPixmat2* pIImage, IRectangle* pIExtendedImageDomain,
                            ZELT_BoundaryCondition boundaryCondition, double padValue, IPixmat2* pIOut,
                            IPixmat2** ppIPixmat) noexcept = 0;
@@ -163,6 +238,8 @@ struct IBasicOps : IDispatch {
     virtual HRESULT ReverseDivideEx(IPixmat2* pIA, VARIANT b, ZELT_Rounding r, IPixmatDescriptor* pIOutDescr,
                                     IPixmat2** ppIOut) noexcept = 0;
     virtual HRESULT SetTo(IPixmat2* pIImg, VARIANT b, IRectangle* pIRect) noexcept = 0;
+    /// With weights 1 and 1. Under ZELT_Offset_Integer the position is rounded down first; an unknown mode is
+    /// E_INVALIDARG.
     virtual HRESULT AddOffset(IPixmat2* pIA, IPixmat2* pIB, ICoordinateFloat* pIPos,
                               ZELT_Offset mode) noexcept = 0;
     virtual HRESULT Min(IPixmat2* pIA, VARIANT b) noexcept = 0;

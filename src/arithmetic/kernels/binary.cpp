@@ -1,6 +1,7 @@
 #include "arithmetic/kernels/binary.h"
 
 #include "arithmetic/kernels/arithmetic_levels.h"
+#include "arithmetic/kernels/plane.h"
 
 #include <cstring>
 #include <utility>
@@ -23,22 +24,6 @@ bool is_colour(const image_layout& l)
     case PixmatEncoding_RGBA: return l.bits == 32;
     default: return false;
     }
-}
-
-/// A pixel at the origin, where each row begins, and what a pixel is.
-struct plane {
-    uint8_t* first = nullptr;
-    int64_t x_stride = 0;
-    int64_t y_stride = 0;
-    storage type = storage::none;
-
-    uint8_t* at(int64_t x, int64_t y) const { return first + y * y_stride + x * x_stride; }
-    bool adjacent() const { return x_stride == bytes_of(type); }
-};
-
-plane plane_of(const image& i, storage type)
-{
-    return {i.data + i.layout.offset, i.layout.x_stride, i.layout.y_stride, type};
 }
 
 /// The operation behind a method. Reversed methods exchange their operands.
@@ -131,9 +116,6 @@ void run_blocks(const block_job& job, block& first, block& second)
                       job.dst.x_stride);
         }
 }
-
-/// True when rows of adjacent pixels follow each other without a gap, so that they are one row.
-bool is_packed(const plane& p, size extent) { return p.y_stride == p.x_stride * extent.width; }
 
 /// dst = a op b on adjacent pixels. A y stride of 0 is that of a single value.
 void run_direct(direct_function loop, plane a, plane b, const plane& dst, range limits, size extent,
@@ -388,10 +370,19 @@ outcome combine(method m, int32_t given_rounding, const image& a, const number& 
                    limits, extent, in_one_row);
         return outcome::done;
     }
-    source pixels{image_pixels, table.load[index(c)][index(from)]};
-    if (chosen.assigns) pixels.load = nullptr;
     block x, y;
     fill_block(b, c, chosen.reversed ? x : y);
+    if (chosen.assigns && out.adjacent()) {
+        table.store[index(c)][index(to)][index(mode)](y.bytes, block_pixels, limits, x.bytes, out.x_stride);
+        const pixel_fill fill(x.bytes, to);
+        const bool in_one_row = is_packed(out, extent);
+        const int64_t row = out.x_stride * extent.width;
+        for (int64_t i = 0; i < (in_one_row ? 1 : extent.height); ++i)
+            fill(out.at(0, i), in_one_row ? row * extent.height : row);
+        return outcome::done;
+    }
+    source pixels{image_pixels, table.load[index(c)][index(from)]};
+    if (chosen.assigns) pixels.load = nullptr;
     run_blocks({chosen.reversed ? source{} : pixels, chosen.reversed ? pixels : source{}, apply,
                 table.store[index(c)][index(to)][index(mode)], out, limits, extent},
                x, y);
