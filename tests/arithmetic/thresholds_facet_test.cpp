@@ -152,6 +152,9 @@ TEST_F(Thresholds, KeepTheAutomaticLimitInBins)
     EXPECT_EQ(values_of<uint8_t>(result), (std::vector<uint8_t>{0, 0, 0})) << "equal to the limit";
     ASSERT_EQ(auto_threshold(row_of<uint8_t>({0, 10, 30, 200, 220}, 8, Unsigned), 5, 6), S_OK);
     EXPECT_EQ(values_of<uint8_t>(result), (std::vector<uint8_t>{5, 5, 5, 6, 6}));
+    ASSERT_EQ(auto_threshold(row_of<uint8_t>({0, 19, 36, 123, 140, 182, 243, 248}, 8, Unsigned), 5, 6), S_OK);
+    EXPECT_EQ(values_of<uint8_t>(result), (std::vector<uint8_t>{5, 5, 5, 6, 6, 6, 6, 6}))
+        << "a step of 0.15 is not the last one";
     ASSERT_EQ(auto_threshold(row_of<uint8_t>({100, 110, 100}, 8, Unsigned), 5, 6), S_OK);
     EXPECT_EQ(values_of<uint8_t>(result), (std::vector<uint8_t>{6, 6, 6})) << "the limit is 55 of 128 bins";
 }
