@@ -31,7 +31,7 @@ HRESULT map(void (*kernel)(const memory_2d&, const memory_2d&), IPixmat2* image,
             auto dst = ResolveOutput(image, out);
             const ImageReadAccess src(image);
             kernel(src.view(), dst.view());
-            return dst;
+            return committed(dst);
         });
     });
 }
@@ -56,7 +56,7 @@ HRESULT CBasic2::Power(IPixmat2* pIA, double exponent, IPixmat2* pIOutImg, IPixm
         auto dst = ResolveOutput(pIA, pIOutImg);
         const ImageReadAccess src(pIA);
         Arithmetic::power(src.view(), exponent, dst.view());
-        return dst;
+        return committed(dst);
     });
 }
 

@@ -17,7 +17,7 @@ HRESULT map(angle_function f, IPixmat2* image, IPixmat2* out, IPixmat2** result)
         const ImageReadAccess src(image);
         auto dst = ResolveOutputTyped(out, size_of(src), pixel_type::float_32);
         Arithmetic::map(f, src.view(), dst.view());
-        return dst;
+        return committed(dst);
     });
 }
 
@@ -59,7 +59,7 @@ HRESULT CMath::Atan2(IPixmat2* pIImageA, IPixmat2* pIImageB, IPixmat2* pIOutImg,
         const ImageReadAccess a(pIImageA), b(pIImageB);
         auto dst = ResolveOutputTyped(pIOutImg, size_of(a), pixel_type::float_32);
         Arithmetic::arc_tangent_2(a.view(), b.view(), dst.view());
-        return dst;
+        return committed(dst);
     });
 }
 
