@@ -1,3 +1,3 @@
-# Functions that are the same on every processor.
+# Powers that are the same on every processor.
 find_library(ZELT_SLEEF sleef REQUIRED)
 zelt_room_uses(arithmetic ${ZELT_SLEEF})

@@ -1,0 +1,158 @@
+// What is made of the differences of a smoothed image. Its rows have two clamped pixels before and behind them; the
+// rows above and below are clamped here.
+#pragma once
+
+#include "filters/kernels/gauss_recursion.inl"
+
+namespace Qor::Luxar::ZELT::ZELT_LEVEL::gauss {
+
+using Filters::gauss_differences;
+
+/// The rows of a smoothed image around one of them.
+template <class S>
+struct rows_around {
+    const S* row[5];
+
+    rows_around(const gauss_differences& d, int64_t y)
+    {
+        for (int64_t i = 0; i < 5; ++i) {
+            const int64_t wanted = y + i - 2, last = d.height - 1;
+            const int64_t inside = wanted < 0 ? 0 : wanted > last ? last : wanted;
+            row[i] = reinterpret_cast<const S*>(d.smooth.first + inside * d.smooth.y_stride);
+        }
+    }
+    S operator()(int64_t x, int64_t dx, int64_t dy) const { return row[2 + dy][x + dx]; }
+};
+
+/// The hypotenuse in single precision: in double, where the squares are exact, and rounded once.
+inline float hypotenuse(float a, float b)
+{
+    const double x = a, y = b;
+    const double length = __builtin_sqrt(x * x + y * y);
+    const bool infinite = __builtin_fabsf(a) == __builtin_inff() || __builtin_fabsf(b) == __builtin_inff();
+    return infinite ? __builtin_inff() : static_cast<float>(length);
+}
+
+/// sqrt(2) |v|, correctly rounded: the product and the rest of the constant are added with what the product lost.
+inline double times_sqrt_2(double v)
+{
+    constexpr double sqrt_2 = 0x1.6a09e667f3bcdp0, rest = -0x1.bdd3413b26456p-54;
+    constexpr double split = 0x1p27 + 1; // halves a number into two of 26 bits
+    constexpr double high = sqrt_2 * split - (sqrt_2 * split - sqrt_2), low = sqrt_2 - high;
+    const double a = __builtin_fabs(v);
+    const double shifted = a * split;
+    const double a_high = shifted - (shifted - a), a_low = a - a_high;
+    const double product = a * sqrt_2;
+    const double lost = ((a_high * high - product) + a_high * low + a_low * high) + a_low * low;
+    const double sum = product + (lost + a * rest);
+    return sum == sum ? sum : product; // infinite, NaN, or too large to be split
+}
+
+struct of_gradient {
+    template <class S>
+    static float at(const rows_around<S>& s, int64_t x)
+    {
+        return hypotenuse(static_cast<float>(s(x, 1, 0) - s(x, -1, 0)),
+                          static_cast<float>(s(x, 0, 1) - s(x, 0, -1)));
+    }
+};
+
+template <class S>
+inline S second_x(const rows_around<S>& s, int64_t x)
+{
+    return S(0.25) * (s(x, -2, 0) + s(x, 2, 0) - 2 * s(x, 0, 0));
+}
+template <class S>
+inline S second_y(const rows_around<S>& s, int64_t x)
+{
+    return S(0.25) * (s(x, 0, -2) + s(x, 0, 2) - 2 * s(x, 0, 0));
+}
+template <class S>
+inline S first_x(const rows_around<S>& s, int64_t x)
+{
+    return (s(x, 1, 0) - s(x, -1, 0)) * S(0.5);
+}
+template <class S>
+inline S first_y(const rows_around<S>& s, int64_t x)
+{
+    return (s(x, 0, 1) - s(x, 0, -1)) * S(0.5);
+}
+
+struct of_laplacian {
+    template <class S>
+    static float at(const rows_around<S>& s, int64_t x)
+    {
+        return hypotenuse(static_cast<float>(second_x(s, x)), static_cast<float>(second_y(s, x)));
+    }
+};
+
+struct of_sdgd {
+    template <class S>
+    static double at(const rows_around<S>& s, int64_t x)
+    {
+        const double gx = first_x(s, x), gy = first_y(s, x);
+        const double gxx = second_x(s, x), gyy = second_y(s, x);
+        const double gxy = (first_y(s, x + 1) - first_y(s, x - 1)) * S(0.5);
+        const double v = (gx * gx * gxx + 2 * gx * gy * gxy + gy * gy * gyy) / (gx * gx + gy * gy + 0.1);
+        return times_sqrt_2(v);
+    }
+};
+
+/// Operation is of each pixel; the results are limited to the type T.
+template <class Operation, class T, class S>
+void each_difference(const gauss_differences& d)
+{
+    const int64_t width = d.width, height = d.height;
+    for (int64_t y = 0; y < height; ++y) {
+        const rows_around<S> around(d, y);
+        for (int64_t left = 0; left < width; left += columns_at_once) {
+            const int64_t count = width - left < columns_at_once ? width - left : columns_at_once;
+            decltype(Operation::at(around, 0)) results[columns_at_once];
+            for (int64_t i = 0; i < count; ++i) results[i] = Operation::at(around, left + i);
+            store<limited<T>>(results, count, d.dst.first + y * d.dst.y_stride + left * d.dst.x_stride,
+                              d.dst.x_stride);
+        }
+    }
+}
+
+template <class T>
+void gradient(const gauss_differences& d)
+{
+    each_difference<of_gradient, T, typename scratch_of<T>::type>(d);
+}
+template <class T>
+void laplacian(const gauss_differences& d)
+{
+    each_difference<of_laplacian, T, typename scratch_of<T>::type>(d);
+}
+template <class T>
+void sdgd(const gauss_differences& d)
+{
+    each_difference<of_sdgd, T, typename scratch_of<T>::type>(d);
+}
+
+struct of_first_x {
+    template <class S>
+    static S at(const rows_around<S>& s, int64_t x)
+    {
+        return first_x(s, x);
+    }
+};
+struct of_first_y {
+    template <class S>
+    static S at(const rows_around<S>& s, int64_t x)
+    {
+        return first_y(s, x);
+    }
+};
+
+template <class S>
+void xy(const gauss_differences& d)
+{
+    each_difference<of_first_x, float, S>(d);
+    gauss_differences in_y = d;
+    in_y.dst = d.dst_y;
+    each_difference<of_first_y, float, S>(in_y);
+}
+
+} // namespace Qor::Luxar::ZELT::ZELT_LEVEL::gauss

@@ -1,0 +1,3 @@
+# Functions that are the same on every processor.
+find_library(ZELT_SLEEF sleef REQUIRED)
+zelt_room_uses(filters ${ZELT_SLEEF})
