@@ -1,9 +1,9 @@
 #include "argument_text.h"
 
 #include "array_text.h"
+#include "common/value_objects.h"
 #include "failure.h"
 #include "number_text.h"
-#include "value_objects.h"
 
 #include <algorithm>
 #include <optional>
@@ -181,22 +181,26 @@ variant parse_object(const argument_info& a, const std::string& text)
     }
     if (type == "ISizeInt") {
         const auto n = numbers(2, "width,height");
-        return make(make_size(integer(n[0]), integer(n[1])));
+        return make(host::make_size(integer(n[0]), integer(n[1])));
     }
     if (type == "IRangeFloat") {
         const auto n = numbers(2, "low,high");
-        return make(make_range(n[0], n[1]));
+        return make(host::make_range(n[0], n[1]));
     }
     if (type == "IComplex") {
         const auto value = parse_complex(text);
         if (!value) refuse(a, text, "is not re,im");
-        return make(make_complex(*value));
+        return make(host::make_complex(*value));
     }
-    if (type == "IPixmatDescriptor") return make(make_descriptor(parse_layout(a, text)));
+    if (type == "IPixmatDescriptor") return make(host::make_descriptor(parse_layout(a, text)));
     if (type == "ILookupTable") {
         const auto list = text.starts_with('@') ? numbers_of_file(text.substr(1)) : parse_numbers(text);
         if (!list || list->size() < 3) refuse(a, text, "is not low,high,colour,colour...");
-        return make(make_lookup_table(*list));
+        try {
+            return make(host::make_lookup_table(*list));
+        } catch (const std::invalid_argument& e) {
+            throw usage_error(std::string(e.what()) + ", or #rrggbb");
+        }
     }
     refuse(a, text, "cannot be given: a " + type + " has no form for the command line");
 }
@@ -219,7 +223,7 @@ std::optional<variant> parse_operand(const argument_info& a, const std::string& 
             }
     if (auto number = parse_number(text)) return std::move(*number);
     if (const auto complex = parse_complex(text))
-        return variant(static_cast<IDispatch*>(make_complex(*complex).get()));
+        return variant(static_cast<IDispatch*>(host::make_complex(*complex).get()));
     return {};
 }
 

@@ -1,8 +1,8 @@
 #include "array_text.h"
 
+#include "common/value_objects.h"
 #include "failure.h"
 #include "number_text.h"
-#include "value_objects.h"
 
 #include <algorithm>
 #include <cstring>
@@ -54,9 +54,9 @@ variant element(const std::string& name, const std::string& word, VARTYPE type)
         const auto alone = parse_number(word);
         variant real;
         if (!value && alone && succeeded(VariantChangeType(real.put(), alone->get(), 0, VT_R8)))
-            return variant(static_cast<IDispatch*>(make_complex(real->dblVal).get()));
+            return variant(static_cast<IDispatch*>(host::make_complex(real->dblVal).get()));
         if (!value) throw usage_error(name + ": '" + word + "' is not a number");
-        return variant(static_cast<IDispatch*>(make_complex(*value).get()));
+        return variant(static_cast<IDispatch*>(host::make_complex(*value).get()));
     }
     auto number = parse_number(word);
     if (!number) throw usage_error(name + ": '" + word + "' is not a number");

@@ -1,5 +1,6 @@
 #include "facets.h"
 
+#include "common/zero_divisor.h"
 #include "failure.h"
 
 #include <algorithm>
@@ -95,13 +96,6 @@ variant invoke(IDispatch* object, const method_info& method, uint16_t kind, std:
 
 } // namespace
 
-const interface_info* table_of(IDispatch* object)
-{
-    com_ptr<ITypeInfo> type;
-    if (!object || failed(object->GetTypeInfo(0, LOCALE_USER_DEFAULT, type.put())) || !type) return nullptr;
-    return type->Describe();
-}
-
 library::library() : root_(zelt::create<IDispatch>("ZELT.Main2")), table_(table_of(root_.get()))
 {
     if (!table_) throw failure("the library does not describe itself");
@@ -168,6 +162,12 @@ std::string near_misses(const std::string& name, std::span<const std::string> kn
 
 variant call_late(IDispatch* object, const method_info& method, std::vector<variant>& values)
 {
+    const interface_info* table = table_of(object);
+    if (table && host::divides(*table, method)) {
+        std::vector<const VARIANT*> arguments;
+        for (const variant& value : values) arguments.push_back(value.get());
+        host::refuse_zero_divisor(method, arguments);
+    }
     return invoke(object, method, method.kind, values);
 }
 
@@ -175,19 +175,6 @@ variant get_late(IDispatch* object, const method_info& property)
 {
     std::vector<variant> none;
     return invoke(object, property, DISPATCH_PROPERTYGET, none);
-}
-
-bool is_image(const argument_info& a)
-{
-    return a.interface_id && *a.interface_id == Qor::Luxar::IPixmat2::iid;
-}
-
-std::vector<const argument_info*> inputs_of(const method_info& method)
-{
-    std::vector<const argument_info*> inputs;
-    for (const argument_info& a : method.arguments)
-        if (a.way == direction::in) inputs.push_back(&a);
-    return inputs;
 }
 
 } // namespace cli

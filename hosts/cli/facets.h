@@ -1,7 +1,7 @@
 // The library by name: facets, their methods as the interface tables describe them, and late-bound calls.
 #pragma once
 
-#include "zelt/zelt.h"
+#include "common/interfaces.h"
 
 #include <span>
 #include <string>
@@ -15,8 +15,9 @@ using Qor::IDispatch;
 using Qor::interface_info;
 using Qor::method_info;
 
-/// The table of any object; null for one that has none.
-const interface_info* table_of(IDispatch* object);
+using host::inputs_of;
+using host::is_image;
+using host::table_of;
 
 struct facet {
     std::string name;
@@ -55,15 +56,10 @@ bool same_name(const std::string& a, const std::string& b);
 std::string near_misses(const std::string& name, std::span<const std::string> known);
 
 /// Of an object that is called, by name and through IDispatch, as a script would: values for all arguments but the
-/// result, in order. Places of out arguments are filled. Throws zelt::error.
+/// result, in order. Places of out arguments are filled. A zero divisor of whole numbers is refused. Throws zelt::error.
 Qor::variant call_late(IDispatch* object, const method_info& method, std::vector<Qor::variant>& values);
 
 /// Reads a property without arguments.
 Qor::variant get_late(IDispatch* object, const method_info& property);
-
-bool is_image(const argument_info& a);
-
-/// The arguments that a caller gives, in order.
-std::vector<const argument_info*> inputs_of(const method_info& method);
 
 } // namespace cli

@@ -14,7 +14,7 @@ function(zelt_image_files library)
     add_library(zelt_image_files STATIC ${folder}/image_file.cpp ${folder}/image_pixels.cpp ${folder}/output_file.cpp
         ${folder}/tiff_directory.cpp ${folder}/tiff_reader.cpp ${folder}/tiff_writer.cpp ${folder}/png_file.cpp
         ${folder}/fits_file.cpp ${folder}/codecs.cpp)
-    target_include_directories(zelt_image_files PUBLIC ${folder})
+    target_include_directories(zelt_image_files PUBLIC ${folder} ${PROJECT_SOURCE_DIR}/hosts)
     target_link_libraries(zelt_image_files PUBLIC ${library} PkgConfig::CFITSIO ${CMAKE_DL_LIBS})
 
     if(library STREQUAL zelt)
@@ -22,7 +22,7 @@ function(zelt_image_files library)
         target_link_libraries(zelt_codecs PRIVATE zelt_image_files)
     else()
         add_library(zelt_codecs OBJECT ${folder}/codecs/opencv_codecs.cpp)
-        target_include_directories(zelt_codecs PRIVATE ${folder})
+        target_include_directories(zelt_codecs PRIVATE ${folder} ${PROJECT_SOURCE_DIR}/hosts)
         target_link_libraries(zelt_codecs PRIVATE ${library})
         target_sources(zelt_image_files PRIVATE $<TARGET_OBJECTS:zelt_codecs>)
         target_compile_definitions(zelt_image_files PRIVATE ZELT_CODECS_LINKED)

@@ -56,21 +56,6 @@ std::string message_of(const zelt::error& e)
     return "failed";
 }
 
-image_layout layout_of(IPixmat2* image)
-{
-    com_ptr<IPixmatDescriptor> d;
-    zelt::check(image->GetDescriptor(d.put()));
-    image_layout layout;
-    zelt::check(d->get_Width(&layout.width));
-    zelt::check(d->get_Height(&layout.height));
-    zelt::check(d->get_Bits(&layout.bits));
-    zelt::check(d->get_Encoding(&layout.encoding));
-    zelt::check(d->get_Offset(&layout.offset));
-    zelt::check(d->get_XStride(&layout.x_stride));
-    zelt::check(d->get_YStride(&layout.y_stride));
-    return layout;
-}
-
 new_image::new_image(int64_t width, int64_t height, int bits, PixmatEncoding encoding)
 {
     const int64_t bytes = (int64_t{bits} + 7) / 8;

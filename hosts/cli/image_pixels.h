@@ -1,7 +1,7 @@
 // Pixels of image objects for readers and writers of files.
 #pragma once
 
-#include "zelt/zelt.h"
+#include "common/layout_of.h"
 
 #include <memory>
 #include <string>
@@ -25,7 +25,7 @@ bool find_encoding(const std::string& name, Qor::Luxar::PixmatEncoding* encoding
 /// What a failed call of the library has to say: its description, or what the code means.
 std::string message_of(const zelt::error& e);
 
-image_layout layout_of(IPixmat2* image);
+using host::layout_of;
 
 /// A packed image of the library, open for the reader that fills it. `data` is null only for an image without pixels.
 struct new_image {

@@ -97,17 +97,6 @@ std::optional<std::complex<double>> parse_complex(const std::string& text)
     return std::complex(re, im);
 }
 
-std::optional<VARTYPE> find_type(const std::string& text)
-{
-    static constexpr std::pair<const char*, VARTYPE> types[] = {
-        {"VT_I1", VT_I1},   {"VT_UI1", VT_UI1}, {"VT_I2", VT_I2},   {"VT_UI2", VT_UI2}, {"VT_I4", VT_I4},
-        {"VT_UI4", VT_UI4}, {"VT_I8", VT_I8},   {"VT_UI8", VT_UI8}, {"VT_R4", VT_R4},   {"VT_R8", VT_R8},
-    };
-    for (const auto& [name, type] : types)
-        if (strcasecmp(text.c_str(), name) == 0) return type;
-    return {};
-}
-
 std::vector<std::string> split(const std::string& text, char separator)
 {
     std::vector<std::string> parts;

@@ -1,7 +1,7 @@
 // Numbers as they are typed.
 #pragma once
 
-#include "zelt/zelt.h"
+#include "common/variant_types.h"
 
 #include <complex>
 #include <optional>
@@ -23,8 +23,7 @@ std::optional<std::vector<double>> parse_numbers(const std::string& text);
 /// "1,2", "1+2i", "-2i".
 std::optional<std::complex<double>> parse_complex(const std::string& text);
 
-/// "VT_R4".
-std::optional<Qor::VARTYPE> find_type(const std::string& text);
+using host::find_type;
 
 std::vector<std::string> split(const std::string& text, char separator);
 

@@ -1,28 +1,13 @@
 #include "arithmetic/basic2.h"
 
+#include "arithmetic/by_codes.h"
 #include "arithmetic/combine.h"
 #include "frame/operation.h"
 #include "frame/value_objects.h"
 
 namespace Qor::Luxar::ZELT {
-namespace {
 
 using Arithmetic::method;
-
-/// Methods that report by codes alone. Nothing in the engine throws on its own; what still does becomes a code.
-template <class Body>
-HRESULT by_codes(Body&& body) noexcept
-{
-    try {
-        return body();
-    } catch (const std::bad_alloc&) {
-        return E_OUTOFMEMORY;
-    } catch (...) {
-        return E_UNEXPECTED;
-    }
-}
-
-} // namespace
 
 HRESULT CBasic2::Add(IPixmat2* pIA, VARIANT b, IPixmat2* pIOutImg, IPixmat2** ppIOut) noexcept
 {

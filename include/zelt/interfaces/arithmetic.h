@@ -169,7 +169,19 @@ struct IBasicOps2 : IDispatch {
     ///            E_POINTER, after the work, for a null ppIOut.
     virtual HRESULT Combine(IPixmat2* pIBaseImage, IPixmat2* pICombineImage, IPixmat2* pIWeightMask,
                             IPixmat2* pIOutImg, IPixmat2** ppIOut) noexcept = 0;
+
+    /// e to the power of each pixel.
+    /// Pixels     Float 32 and 64; the result has the format of the input.
+    /// Values     within one unit in the last place, computed in the precision of the pixel, with the same bits on every
+    ///            processor. Infinite beyond the largest number (Float 64 from 1.79769e308 on), 0 below the smallest.
+    /// In place   allowed.
+    /// NaN        gives NaN.
+    /// Fails      "null IPixmat2" (E_INVALIDARG); E_INVALIDARG for an output of another encoding, depth or size, "Exp():
+    ///            Output image must have same format as input image"; E_NOTIMPL without text for any other pixel
+    ///            type; E_POINTER, after the work, for a null ppIOut.
     virtual HRESULT Exp(IPixmat2* pIImage, IPixmat2* pIOutImg, IPixmat2** ppIOut) noexcept = 0;
+    /// The natural logarithm of each pixel: of 0 negative infinity, of a negative number NaN.
+    /// What else holds for Exp holds here; the text is "Log(): Output image must have same format as input image".
     virtual HRESULT Log(IPixmat2* pIImage, IPixmat2* pIOutImg, IPixmat2** ppIOut) noexcept = 0;
     /// Shades a colour image by a mask.
     /// Pixels     pIImage: RGB, RGBA or BGR of 24 or 32 bits; pIMask: real, of the same size. The output has the format
@@ -197,6 +209,18 @@ struct IBasicOps2 : IDispatch {
     virtual HRESULT Extend(IPixmat2* pIImage, IRectangle* pIExtendedImageDomain,
                            ZELT_BoundaryCondition boundaryCondition, double padValue, IPixmat2* pIOut,
                            IPixmat2** ppIPixmat) noexcept = 0;
+
+    /// Each pixel to the same power.
+    /// Pixels     Float 32 and 64; the result has the type and size of the input.
+    /// Arguments  exponent: any number; for Float 32 it is rounded to a 32-bit float first.
+    /// Values     within one unit in the last place, with the same bits on every processor; squares (2) and square
+    ///            roots (0.5) exactly rounded. Zeros, infinite numbers and negative pixels as the C standard has them:
+    ///            a negative pixel to an exponent that is not whole is NaN; to an odd one it keeps its sign.
+    /// In place   allowed.
+    /// NaN        gives NaN, except that any pixel to the power 0, and 1 to any power, is 1.
+    /// Fails      E_INVALIDARG, in this order: "null IPixmat2"; "Power: src and dst pixel types must be identical";
+    ///            "Power: unsupported pixel type"; "Power: src and dst must have the same size".
+    ///            E_POINTER, after the work, for a null ppIOut.
     virtual HRESULT Power(IPixmat2* pIA, double exponent, IPixmat2* pIOutImg, IPixmat2** ppIOut) noexcept = 0;
 };
 
@@ -261,10 +285,44 @@ struct IBasicOps : IDispatch {
                                 IPixmat2** ppIOut) noexcept = 0;
 };
 
+/// Trigonometry, pixel by pixel. Angles are in radians. What holds for all methods:
+/// Pixels     Unsigned and Signed of up to 32 bits, Float 32 and 64. The result is a Float 32 image of the same size.
+/// Arguments  pIOutImg: receives the result, if given. ppIOut: the result, with a reference added.
+/// Values     a pixel becomes a 32-bit float first (a 64-bit float and a large integer are rounded); the result lies
+///            within one unit in its last place, 0.6 where the angle is below 2^22, and has the same bits on every
+///            processor. Zeros keep their sign in Sin, Tan, Asin and Atan.
+/// In place   the output may be the input, or either of both, when that is Float 32.
+/// NaN        gives NaN, as does an infinite angle, and a value outside [-1, 1] in Asin and Acos.
+/// Threads    everything runs on the calling thread.
+/// Fails      E_INVALIDARG, in this order: "null IPixmat2"; "ZELT::Math images must have the same size" for an output
+///            of another size; "Math result image must be float"; "ZELT::Math: unsupported pixel type".
+///            E_POINTER, after the work, for a null ppIOut.
 struct IMath : IDispatch {
     static constexpr GUID iid = guid("5a1e0000-0342-4000-8000-00000000c0de");
     static constexpr const char* interface_name = "IMath";
     using base = IDispatch;
+
+    /// Sine of an angle of any size.
+    virtual HRESULT Sin(IPixmat2* pIImage, IPixmat2* pIOutImg, IPixmat2** ppIOut) noexcept = 0;
+    /// Cosine of an angle of any size.
+    virtual HRESULT Cos(IPixmat2* pIImage, IPixmat2* pIOutImg, IPixmat2** ppIOut) noexcept = 0;
+    /// Tangent of an angle of any size.
+    virtual HRESULT Tan(IPixmat2* pIImage, IPixmat2* pIOutImg, IPixmat2** ppIOut) noexcept = 0;
+    /// The angle from -pi/2 to pi/2 with this sine.
+    virtual HRESULT Asin(IPixmat2* pIImage, IPixmat2* pIOutImg, IPixmat2** ppIOut) noexcept = 0;
+    /// The angle from 0 to pi with this cosine.
+    virtual HRESULT Acos(IPixmat2* pIImage, IPixmat2* pIOutImg, IPixmat2** ppIOut) noexcept = 0;
+    /// The angle from -pi/2 to pi/2 with this tangent; the ends belong to infinite pixels.
+    virtual HRESULT Atan(IPixmat2* pIImage, IPixmat2* pIOutImg, IPixmat2** ppIOut) noexcept = 0;
+
+    /// The angle from -pi to pi between the x axis and the point with y from pIImageA and x from pIImageB.
+    /// Values     zeros and infinite numbers as in the C standard: (0, -0) is pi, (-0, -0) is -pi, two infinite ones
+    ///            lie on a diagonal.
+    /// Fails      E_INVALIDARG, in this order: "null IPixmat2"; "ZELT::Math images must have the same pixel type";
+    ///            "ZELT::Math images must have the same size"; "ZELT::Math result image must be float";
+    ///            "ZELT::Math: unsupported pixel type".
+    virtual HRESULT Atan2(IPixmat2* pIImageA, IPixmat2* pIImageB, IPixmat2* pIOutImg,
+                          IPixmat2** ppIOut) noexcept = 0;
 };
 
 } // namespace Qor::Luxar::ZELT

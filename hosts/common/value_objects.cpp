@@ -1,14 +1,13 @@
-#include "value_objects.h"
-
-#include "failure.h"
+#include "common/value_objects.h"
 
 #include <atomic>
 #include <cmath>
+#include <stdexcept>
 
 using namespace Qor;
 using namespace Qor::Luxar;
 
-namespace cli {
+namespace host {
 namespace {
 
 /// An object of one interface; methods call its functions directly, so it need not answer by name.
@@ -100,8 +99,8 @@ public:
     explicit lookup_table(const std::vector<double>& numbers) : low_(numbers[0]), high_(numbers[1])
     {
         for (size_t i = 2; i < numbers.size(); ++i) {
-            if (numbers[i] < 0 || numbers[i] > 0xffffff || numbers[i] != std::floor(numbers[i]))
-                throw usage_error("a colour is a whole number up to 16777215, or #rrggbb");
+            if (!(numbers[i] >= 0 && numbers[i] <= 0xffffff) || numbers[i] != std::floor(numbers[i]))
+                throw std::invalid_argument("a colour is a whole number up to 16777215");
             colours_.push_back(static_cast<ULONG>(numbers[i]));
         }
     }
@@ -163,4 +162,4 @@ com_ptr<IPixmatDescriptor> make_descriptor(const image_layout& layout)
     return d;
 }
 
-} // namespace cli
+} // namespace host

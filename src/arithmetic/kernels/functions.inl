@@ -1,0 +1,226 @@
+// The loops of the functions of a pixel, on adjacent pixels.
+//
+// Single precision: elementary.inl, with the plainest form for runs of ordinary values; the careful form gives those the
+// same bits. Double precision, and angles too large for a quick reduction: SLEEF's functions for results that are the
+// same on every processor, within one unit in the last place of a double.
+#pragma once
+
+#include "arithmetic/kernels/elementary.inl"
+#include "arithmetic/kernels/functions_table.h"
+
+#include <sleef.h>
+
+namespace Qor::Luxar::ZELT::ZELT_LEVEL::functions {
+
+/// Values that are looked at before one form of a function is taken for all of them.
+inline constexpr int64_t run_length = 256;
+
+/// body(p..., n, q) for all pixels, a vector at a time. The last ones go through memory of a vector's size.
+template <class T, class Function, class... From>
+void map(uint8_t* to, int64_t count, Function f, From... from)
+{
+    constexpr int64_t step = lanes * static_cast<int64_t>(sizeof(T));
+    const int64_t end = count / lanes * step, rest = count * static_cast<int64_t>(sizeof(T)) - end;
+    for (int64_t i = 0; i < end; i += step)
+        store(reinterpret_cast<T*>(to + i), f(load(reinterpret_cast<const T*>(from + i))...));
+    if (rest == 0) return;
+    const auto load_rest = [=](const uint8_t* p) {
+        T values[lanes] = {};
+        __builtin_memcpy(values, p + end, static_cast<size_t>(rest));
+        return load(values);
+    };
+    T results[lanes];
+    store(results, f(load_rest(from)...));
+    __builtin_memcpy(to + end, results, static_cast<size_t>(rest));
+}
+
+template <class T>
+T value_at(const uint8_t* p, int64_t i)
+{
+    T v;
+    __builtin_memcpy(&v, p + i * static_cast<int64_t>(sizeof v), sizeof v);
+    return v;
+}
+
+/// body(first byte, count) for runs of up to run_length pixels.
+template <class T, class Body>
+void each_run(int64_t count, Body body)
+{
+    for (int64_t i = 0; i < count; i += run_length)
+        body(i * static_cast<int64_t>(sizeof(T)), count - i < run_length ? count - i : run_length);
+}
+
+/// True when some value is larger than the limit. NaN is not.
+inline bool holds_larger(const uint8_t* from, int64_t count, float limit)
+{
+    int32_t outside = 0;
+    for (int64_t i = 0; i < count; ++i) {
+        const float v = value_at<float>(from, i);
+        outside |= (v < 0 ? -v : v) > limit ? 1 : 0;
+    }
+    return outside != 0;
+}
+
+/// True when all values are positive and finite.
+inline bool are_ordinary(const uint8_t* from, int64_t count)
+{
+    int32_t outside = 0;
+    for (int64_t i = 0; i < count; ++i) {
+        const float v = value_at<float>(from, i);
+        outside |= v > 0 ? 0 : 1;
+        outside |= v < __builtin_inff() ? 0 : 1;
+    }
+    return outside == 0;
+}
+
+/// A function of angles; large ones take the function that reduces them with all of pi.
+template <class Function, class Exact>
+void map_angles(const uint8_t* from, uint8_t* to, int64_t count, Function f, Exact of_large)
+{
+    each_run<float>(count, [=](int64_t first, int64_t n) {
+        if (!holds_larger(from + first, n, largest_angle)) return map<float>(to + first, n, f, from + first);
+        float angles[run_length];
+        __builtin_memcpy(angles, from + first, static_cast<size_t>(n) * sizeof(float));
+        map<float>(to + first, n, f, from + first);
+        for (int64_t i = 0; i < n; ++i) {
+            const float size = angles[i] < 0 ? -angles[i] : angles[i];
+            if (!(size > largest_angle)) continue;
+            const float r = size < __builtin_inff()
+                                ? static_cast<float>(of_large(static_cast<double>(angles[i])))
+                                : __builtin_nanf("");
+            __builtin_memcpy(to + first + i * static_cast<int64_t>(sizeof r), &r, sizeof r);
+        }
+    });
+}
+
+inline void map_sine(const uint8_t* from, uint8_t* to, int64_t count)
+{
+    map_angles(
+        from, to, count, [](reals x) { return sine(x); },
+        [](double x) { return Sleef_cinz_sind1_u10purec(x); });
+}
+inline void map_cosine(const uint8_t* from, uint8_t* to, int64_t count)
+{
+    map_angles(
+        from, to, count, [](reals x) { return cosine(x); },
+        [](double x) { return Sleef_cinz_cosd1_u10purec(x); });
+}
+inline void map_tangent(const uint8_t* from, uint8_t* to, int64_t count)
+{
+    map_angles(
+        from, to, count, [](reals x) { return tangent(x); },
+        [](double x) { return Sleef_cinz_tand1_u10purec(x); });
+}
+inline void map_arc_sine(const uint8_t* from, uint8_t* to, int64_t count)
+{
+    map<float>(
+        to, count, [](reals x) { return arc_sine(x); }, from);
+}
+inline void map_arc_cosine(const uint8_t* from, uint8_t* to, int64_t count)
+{
+    map<float>(
+        to, count, [](reals x) { return arc_cosine(x); }, from);
+}
+inline void map_arc_tangent(const uint8_t* from, uint8_t* to, int64_t count)
+{
+    map<float>(
+        to, count, [](reals x) { return arc_tangent(x); }, from);
+}
+inline void map_arc_tangent_2(const uint8_t* a, const uint8_t* b, uint8_t* to, int64_t count)
+{
+    map<float>(
+        to, count, [](reals y, reals x) { return arc_tangent_2(y, x); }, a, b);
+}
+
+#if defined(__AVX512F__)
+inline reals exponential_of_double(reals x) { return Sleef_cinz_expd8_u10avx512fnofma(x); }
+inline reals logarithm_of_double(reals x) { return Sleef_cinz_logd8_u10avx512fnofma(x); }
+inline reals power_of_double(reals x, reals y) { return Sleef_cinz_powd8_u10avx512fnofma(x, y); }
+#elif defined(__AVX2__)
+inline reals exponential_of_double(reals x) { return Sleef_cinz_expd4_u10avx(x); }
+inline reals logarithm_of_double(reals x) { return Sleef_cinz_logd4_u10avx(x); }
+inline reals power_of_double(reals x, reals y) { return Sleef_cinz_powd4_u10avx(x, y); }
+#elif defined(__SSE2__)
+inline reals exponential_of_double(reals x) { return Sleef_cinz_expd2_u10sse2(x); }
+inline reals logarithm_of_double(reals x) { return Sleef_cinz_logd2_u10sse2(x); }
+inline reals power_of_double(reals x, reals y) { return Sleef_cinz_powd2_u10sse2(x, y); }
+#else
+inline reals exponential_of_double(reals x)
+{
+    return reals{Sleef_cinz_expd1_u10purec(x[0]), Sleef_cinz_expd1_u10purec(x[1])};
+}
+inline reals logarithm_of_double(reals x)
+{
+    return reals{Sleef_cinz_logd1_u10purec(x[0]), Sleef_cinz_logd1_u10purec(x[1])};
+}
+inline reals power_of_double(reals x, reals y)
+{
+    return reals{Sleef_cinz_powd1_u10purec(x[0], y[0]), Sleef_cinz_powd1_u10purec(x[1], y[1])};
+}
+#endif
+
+template <class T>
+void map_exponential(const uint8_t* from, uint8_t* to, int64_t count)
+{
+    const auto f = [](reals x) {
+        if constexpr (sizeof(T) == sizeof(double)) return exponential_of_double(x);
+        return exponential(x);
+    };
+    map<T>(to, count, f, from);
+}
+
+template <class T>
+void map_logarithm(const uint8_t* from, uint8_t* to, int64_t count)
+{
+    if constexpr (sizeof(T) == sizeof(double)) {
+        map<T>(
+            to, count, [](reals x) { return logarithm_of_double(x); }, from);
+    } else {
+        each_run<T>(count, [=](int64_t first, int64_t n) {
+            if (are_ordinary(from + first, n))
+                map<T>(
+                    to + first, n, [](reals x) { return logarithm_of_ordinary(x); }, from + first);
+            else
+                map<T>(
+                    to + first, n, [](reals x) { return logarithm(x); }, from + first);
+        });
+    }
+}
+
+/// x to an exponent that is 0, infinite or NaN. A power with exponent 0, or of 1, is 1 even with NaN.
+inline reals unusual_power(reals x, double exponent)
+{
+    const reals size = magnitude(x);
+    const double grown = exponent > 0 ? infinity : 0, shrunk = exponent > 0 ? 0 : infinity;
+    if (exponent == 0) return all(1);
+    if (exponent != exponent) return x == 1 ? all(1) : all(exponent);
+    const reals of_number = size > 1 ? all(grown) : size < 1 ? all(shrunk) : all(1);
+    return x == x ? of_number : x;
+}
+
+/// The pixels themselves, squares and roots are exactly rounded. The root of -0 is 0, that of negative infinity infinite.
+template <class T>
+void map_power(const uint8_t* from, uint8_t* to, int64_t count, double exponent)
+{
+    const auto map_all = [=](auto f) { map<T>(to, count, f, from); };
+    if (exponent == 0 || !(exponent > -infinity && exponent < infinity))
+        return map_all([=](reals x) { return unusual_power(x, exponent); });
+    if (exponent == 1) return map_all([](reals x) { return x; });
+    if (exponent == 2) return map_all([](reals x) { return x * x; });
+    if (exponent == 0.5) return map_all([](reals x) { return root(x == -infinity ? -x : x + 0.0); });
+    if constexpr (sizeof(T) == sizeof(double)) {
+        map_all([y = all(exponent)](reals x) { return power_of_double(x, y); });
+    } else {
+        const exponent_kind kind = kind_of(exponent);
+        each_run<T>(count, [=](int64_t first, int64_t n) {
+            if (are_ordinary(from + first, n))
+                map<T>(
+                    to + first, n, [=](reals x) { return power_of_ordinary(x, exponent); }, from + first);
+            else
+                map<T>(
+                    to + first, n, [=](reals x) { return power(x, kind); }, from + first);
+        });
+    }
+}
+
+} // namespace Qor::Luxar::ZELT::ZELT_LEVEL::functions

@@ -1,0 +1,136 @@
+"""What holds over time and across threads and processes."""
+
+import multiprocessing
+import os
+import sys
+import threading
+import time
+
+import numpy as np
+import pytest
+
+import zelt
+
+FRAME = np.arange(4096, dtype="uint16").reshape(64, 64)
+
+
+def resident_bytes():
+    with open("/proc/self/statm") as file:
+        return int(file.read().split()[1]) * os.sysconf("SC_PAGE_SIZE")
+
+
+def test_ten_thousand_calls_leave_memory_flat():
+    root = zelt.create("ZELT.Main2")
+    image = zelt.image(FRAME)
+    small = np.zeros((1, 1), "uint16")
+
+    def refused(call):
+        try:
+            call()
+        except (zelt.Error, TypeError, ValueError, OverflowError):
+            return
+        pytest.fail("this call must fail")
+
+    calls = {
+        "number": lambda: root.Statistics.Mean(FRAME, (0, 0, 9, 9)),
+        "tuple": lambda: root.Statistics.MaximumPosition(image),
+        "result": lambda: np.asarray(root.Basic.Add(image, FRAME)),
+        "complex": lambda: root.Basic.Add(FRAME.astype("complex64"), 1j),
+        "dlpack": lambda: np.from_dlpack(zelt.image(FRAME[::-1])),
+        "capsules": lambda: (image.__dlpack__(), image.__dlpack__(max_version=(1, 0))),
+        "array": lambda: zelt.Variant("VT_ARRAY|VT_R8", FRAME).value,
+        "values": lambda: zelt.Variant("VT_ARRAY|VT_BOOL", [True] * 50).value,
+        "descriptor": lambda: root.Conversions.RecodeEx(FRAME, zelt.descriptor(64, 64, 8)),
+        "library": lambda: refused(lambda: root.Basic.Add(FRAME, small)),
+        "divisor": lambda: refused(lambda: root.Basic.Divide(FRAME, 0)),
+        "third argument": lambda: refused(lambda: root.Basic.Add(FRAME, FRAME, "no image")),
+        "name": lambda: refused(lambda: root.Basic.Add(FRAME, b=small, c=small)),
+        "overflow": lambda: refused(lambda: root.Statistics.Moment(FRAME, 1, 2**70)),
+        "no array": lambda: refused(lambda: zelt.image([[1]])),
+    }
+    for name, call in calls.items():
+        for _ in range(500):
+            call()
+        blocks, memory, arrays = sys.getallocatedblocks(), resident_bytes(), sys.getrefcount(FRAME)
+        for _ in range(10_000):
+            call()
+        assert sys.getrefcount(FRAME) == arrays, name
+        assert sys.getallocatedblocks() - blocks < 200, name
+        assert resident_bytes() - memory < 1 << 20, name
+
+
+def test_other_threads_run_on_during_a_call():
+    root = zelt.create("ZELT.Main2")
+    slow = np.ones((3000, 3000)).T
+    ticks, done = [0], threading.Event()
+
+    def tick():
+        while not done.is_set():
+            ticks[0] += 1
+            time.sleep(0.0005)
+
+    ticker = threading.Thread(target=tick)
+    interval = sys.getswitchinterval()
+    sys.setswitchinterval(1000)  # a thread gives way only where it lets go of the lock
+    try:
+        ticker.start()
+        before = ticks[0]
+        for _ in range(3):
+            root.Basic.Add(slow, slow[::-1], slow)
+        counted = ticks[0] - before
+    finally:
+        sys.setswitchinterval(interval)
+        done.set()
+        ticker.join()
+    assert counted > 10
+
+
+def test_threads_share_a_facet():
+    root = zelt.create("ZELT.Main2")
+    failures = []
+
+    def work(seed):
+        frame = np.random.RandomState(seed).randint(0, 999, (50 + seed, 40), "uint16")
+        for i in range(300):
+            if not np.array_equal(np.asarray(root.Basic.Add(frame, i)), frame + np.uint16(i)):
+                failures.append(seed)
+            if root.Statistics.Maximum(frame) != frame.max():
+                failures.append(-seed)
+
+    threads = [threading.Thread(target=work, args=[n]) for n in range(1, 9)]
+    for t in threads:
+        t.start()
+    for t in threads:
+        t.join()
+    assert not failures
+
+
+def corrected(seed):
+    frame = np.random.RandomState(seed).randint(200, 4000, (300, 200), "uint16")
+    flat = zelt.create("ZELT.Main2").FlatFielding
+    return np.array(flat.FlattenEx(frame, "Unsigned", np.full((300, 200), 100, "uint16"), None))
+
+
+@pytest.mark.parametrize("way", ["fork", "spawn"])
+def test_processes_start_afresh(way):
+    flat = zelt.create("ZELT.Main2").FlatFielding
+    dark = np.full((300, 200), 100, "uint16")
+    here = [corrected(n) for n in range(4)]
+    with multiprocessing.get_context(way).Pool(2) as pool:
+        for mine, theirs in zip(here, pool.map_async(corrected, range(4)).get(timeout=120)):
+            assert np.array_equal(mine, theirs)
+
+
+def use_after_fork(facet, image, answer):
+    answer.put((facet.FlattenEx(image, "Unsigned", FRAME).copy().shape, zelt.create("ZELT.Main2").Statistics.Mean(image)))
+
+
+def test_a_child_uses_the_objects_of_its_parent():
+    context = multiprocessing.get_context("fork")
+    flat, image, answer = zelt.create("ZELT.Main2").FlatFielding, zelt.image(FRAME), context.Queue()
+    flat.FlattenEx(image, "Unsigned", FRAME)
+    child = context.Process(target=use_after_fork, args=(flat, image, answer))
+    child.start()
+    assert answer.get(timeout=60) == ((64, 64), FRAME.mean())
+    child.join(60)
+    assert child.exitcode == 0
