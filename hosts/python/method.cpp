@@ -2,6 +2,7 @@
 
 #include "arguments.h"
 #include "common/zero_divisor.h"
+#include "interrupts.h"
 #include "object.h"
 #include "results.h"
 
@@ -17,7 +18,8 @@ constexpr size_t most_outputs = 8;
 /// All that is known of a method before it is called.
 struct method_plan {
     method_plan(const interface_info& t, const method_info& m, DISPID i)
-        : table(t), info(m), id(i), divides(host::divides(t, m)), locked(m.kind != DISPATCH_METHOD)
+        : table(t), info(m), id(i), divides(host::divides(t, m)), cancellable(can_be_cancelled(t)),
+          locked(m.kind != DISPATCH_METHOD)
     {
         size_t outputs = 0;
         for (const argument_info& a : m.arguments) {
@@ -32,6 +34,7 @@ struct method_plan {
     const method_info& info;
     DISPID id;
     bool divides;
+    bool cancellable;
     /// Properties are short, and the first reading of one makes a facet, which one thread must do.
     bool locked;
     PyTypeObject* owner = nullptr; ///< lives for ever
@@ -223,12 +226,17 @@ py::object call_plan(const method_plan& m, IDispatch* object, const given_values
         code = object->Invoke(m.id, GUID_NULL, LOCALE_USER_DEFAULT, m.info.kind, &params, result.get(),
                               &exception, &bad_argument);
     };
+    bool interrupted = false;
     if (m.locked) {
         invoke();
     } else {
         const without_lock unlocked;
+        interrupt_watch watch(m.cancellable);
         invoke();
+        interrupted = watch.end();
     }
+    // What Python makes of it, usually KeyboardInterrupt, tells more than a cancelled call.
+    if (interrupted && PyErr_CheckSignals() != 0) throw py::error_already_set();
     if (failed(code)) fail(m, values, code, exception, bad_argument);
     return results_of(m, *result.get(), out);
 }

@@ -2,12 +2,14 @@
 
 import multiprocessing
 import os
+import subprocess
 import sys
 import threading
 import time
 
 import numpy as np
 import pytest
+from conftest import BUILD
 
 import zelt
 
@@ -134,3 +136,48 @@ def test_a_child_uses_the_objects_of_its_parent():
     assert answer.get(timeout=60) == ((64, 64), FRAME.mean())
     child.join(60)
     assert child.exitcode == 0
+
+
+INTERRUPTED = """
+import os, signal, sys, threading, time
+import numpy as np, zelt
+filters = zelt.create("ZELT.Main2").Filters
+big, kernel, small = np.ones((1500, 1500)), np.ones((41, 41)), np.ones((8, 8))
+
+def interrupted(call, after=0.2):
+    threading.Timer(after, os.kill, (os.getpid(), signal.SIGINT)).start()
+    start = time.perf_counter()
+    try:
+        call()
+        time.sleep(5)
+    except KeyboardInterrupt:
+        return time.perf_counter() - start
+    sys.exit("nobody was interrupted")
+
+def alone(call):
+    start = time.perf_counter()
+    call()
+    return time.perf_counter() - start
+
+whole = alone(lambda: filters.Convolve(big, kernel, 20, 20))
+taken = interrupted(lambda: filters.Convolve(big, kernel, 20, 20), min(0.2, whole / 10))
+assert taken < whole * 0.7, (taken, whole)
+assert filters.Convolve(small, [[1, 0], [0, 0]], 0, 0).shape == (8, 8)
+interrupted(lambda: filters.Sobel(np.ones((4000, 4000))), 0.01)   # looks for no request
+assert filters.Convolve(small, [[1]], 0, 0).shape == (8, 8)
+seen = []
+signal.signal(signal.SIGINT, lambda *_: seen.append(1))
+threading.Timer(min(0.2, whole / 10), os.kill, (os.getpid(), signal.SIGINT)).start()
+try:
+    filters.Convolve(big, kernel, 20, 20)
+except zelt.Error as e:
+    assert "cancelled" in e.description and seen
+else:
+    sys.exit("the call was not cancelled")
+"""
+
+
+def test_an_interrupt_cancels_the_call():
+    done = subprocess.run([sys.executable, "-c", INTERRUPTED], env={**os.environ, "PYTHONPATH": str(BUILD / "python")},
+                          capture_output=True, text=True, timeout=120)
+    assert done.returncode == 0, done.stderr
