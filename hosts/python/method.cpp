@@ -1,6 +1,7 @@
 #include "method.h"
 
 #include "arguments.h"
+#include "common/layout_of.h"
 #include "common/zero_divisor.h"
 #include "interrupts.h"
 #include "object.h"
@@ -175,6 +176,17 @@ void look_for_zero(const method_plan& m, const call_values& values)
     host::refuse_zero_divisor(m.info, {arguments.data(), values.count()});
 }
 
+/// Calls on small images end before anybody could interrupt them, and are not to pay for a watch.
+bool may_take_long(const method_plan& m, const call_values& values)
+{
+    constexpr int64_t small_image = 64 * 64;
+    if (!m.cancellable || values.count() == 0 || values.at(0).vt != VT_DISPATCH) return false;
+    const com_ptr<IPixmat2> image = query<IPixmat2>(values.at(0).punkVal);
+    if (!image) return false;
+    const image_layout l = host::layout_of(image.get());
+    return int64_t{l.width} * l.height >= small_image;
+}
+
 py::object results_of(const method_plan& m, VARIANT& result, outputs& out)
 {
     py::object first;
@@ -231,7 +243,7 @@ py::object call_plan(const method_plan& m, IDispatch* object, const given_values
         invoke();
     } else {
         const without_lock unlocked;
-        interrupt_watch watch(m.cancellable);
+        interrupt_watch watch(may_take_long(m, values));
         invoke();
         interrupted = watch.end();
     }
