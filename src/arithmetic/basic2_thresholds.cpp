@@ -1,6 +1,7 @@
 #include "arithmetic/basic2.h"
 
 #include "arithmetic/by_codes.h"
+#include "arithmetic/kernels/plane.h"
 #include "arithmetic/kernels/thresholds.h"
 #include "frame/operation.h"
 #include "zelt/com/class_registry.h"
@@ -27,6 +28,7 @@ struct open_images {
     uint8_t* source = nullptr;
     uint8_t* target = nullptr;
     bool in_place = false;
+    std::optional<Arithmetic::stable_operand> stable;
 
     HRESULT open(IPixmat2* input, IPixmat2* given)
     {
@@ -58,14 +60,17 @@ struct open_images {
     bool same_size() const { return from.width == to.width && from.height == to.height; }
 
     /// The views of pixels that can be compared with limits: E_NOTIMPL for an input of another kind, E_INVALIDARG
-    /// for an output of another size or type.
-    HRESULT compare(memory_2d* src, memory_2d* dst) const
+    /// for an output of another size or type. Images that share memory in part give what separate ones would.
+    HRESULT compare(memory_2d* src, memory_2d* dst)
     {
         const auto in = Arithmetic::view_by_depth_class(from, source);
         if (!in) return E_NOTIMPL;
         const auto out = Arithmetic::view_by_depth_class(to, target);
         if (!out || out->type != in->type || !same_size()) return E_INVALIDARG;
-        *src = *in;
+        const int64_t pixel_bytes = GetPixmatBits(in->type) / 8;
+        stable.emplace(Arithmetic::image{from, source}, pixel_bytes, Arithmetic::image{to, target},
+                       pixel_bytes);
+        *src = *Arithmetic::view_by_depth_class(stable->pixels().layout, stable->pixels().data);
         *dst = *out;
         return S_OK;
     }
@@ -147,7 +152,7 @@ HRESULT copy_unsigned(const open_images& images)
     return S_OK;
 }
 
-HRESULT take_absolute(const open_images& images)
+HRESULT take_absolute(open_images& images)
 {
     if (!images.same_size()) return refuse(L"Abs(): Output image must have same format as input image");
     const image_layout& from = images.from;

@@ -299,6 +299,22 @@ TEST_F(Thresholds, LockAnImageOnceWhenItIsBoth)
     }
 }
 
+TEST_F(Thresholds, ReadImagesThatShareMemoryBeforeTheyChangeThem)
+{
+    const auto layout = packed_layout(200, 1, 8, Signed);
+    for (const auto& c : calls) {
+        int8_t memory[201], apart[200];
+        for (int i = 0; i < 201; ++i) memory[i] = static_cast<int8_t>(i % 23 - 4);
+        ASSERT_EQ(c.call(make<foreign_image>(layout, memory).get(), make<foreign_image>(layout, apart).get(),
+                         nullptr),
+                  S_OK);
+        ASSERT_EQ(c.call(make<foreign_image>(layout, memory).get(),
+                         make<foreign_image>(layout, memory + 1).get(), nullptr),
+                  S_OK);
+        EXPECT_TRUE(std::equal(apart, apart + 200, memory + 1)) << c.name;
+    }
+}
+
 TEST_F(Thresholds, FirstGenerationWorksInPlaceOrIntoANewImage)
 {
     const auto image = row_of<int8_t>({-128, -3, 4}, 8, Signed);

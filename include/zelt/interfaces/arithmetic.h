@@ -129,9 +129,50 @@ struct IBasicOps2 : IDispatch {
     /// The greater of pIA and b, always under Fastest. No complex images.
     virtual HRESULT Max(IPixmat2* pIA, VARIANT b, IPixmat2* pIOutImg, IPixmat2** ppIOut) noexcept = 0;
 
+    // What holds for Abs, Threshold, Normalize and AutoThreshold: a new output has the descriptor of pIImage, nominal
+    // bits included; a given one has its size and pixel type, depths of 9 to 16 bits being one type, 17 to 32 another.
+    // The output may be pIImage, which is then opened for writing only; images that share memory in part give what
+    // separate ones would. ppIOut may be null. Images without pixels succeed. Everything runs on the calling thread.
+    // Unless told otherwise: pixels are Unsigned and Signed of 8 to 32 bits and Float 32 and 64. Fails, in this order:
+    // E_INVALIDARG for a null pIImage; what an image answers, unchanged; E_NOTIMPL for other pixels, and for those of
+    // 17 to 24 bits that lie in three bytes; E_INVALIDARG for an output of another size or type.
+
+    /// Absolute values.
+    /// Pixels     Signed of exactly 8, 16 and 32 bits, Float 32 and 64. Unsigned of 1 to 32 bits is copied, into an
+    ///            output of any type that values can be carried over to (IPixmatConverter::ConvertRecode); in place
+    ///            nothing happens.
+    /// Values     the most negative integer stays what it is: -128 for 8 bits.
+    /// NaN        stays.
+    /// Fails      E_INVALIDARG "Abs(): Output image must have same format as input image" for an output of another
+    ///            size, before pixels are looked at.
     virtual HRESULT Abs(IPixmat2* pIImage, IPixmat2* pIOutImg, IPixmat2** ppIOut) noexcept = 0;
+    /// Replaces pixels below one limit and above another.
+    /// Arguments  lowLimit, lowValue, highLimit, highValue: coerced to the pixel's type like any VARIANT, real numbers
+    ///            to integers by rounding half to even. What cannot be coerced, because it is no number or does not
+    ///            fit, is no failure: lowLimit and lowValue then are the lowest finite value of the type, highLimit
+    ///            and highValue the highest. Types are those of the storage: 12 bits reach to 65535.
+    /// Values     lowValue for a pixel below lowLimit, else highValue for one above highLimit, else the pixel. Where
+    ///            highLimit is below lowLimit, lowLimit wins.
+    /// NaN        stays.
     virtual HRESULT Threshold(IPixmat2* pIImage, VARIANT lowLimit, VARIANT lowValue, VARIANT highLimit,
                               VARIANT highValue, IPixmat2* pIOutImg, IPixmat2** ppIOut) noexcept = 0;
+    /// Stretches the contrast between two fractions of the histogram.
+    /// Arguments  low, high: from 0 to 1. The stretch starts at the histogram's bin lo, in which the pixels so far
+    ///            become more than low times all (rounded down), and ends at hi, from lo on the first one in which
+    ///            they become at least high times all (rounded up). Where hi is not above lo, nothing is stretched:
+    ///            offset 0 and factor 1 stand below.
+    /// Bins       8 and 16 bits: one for each value. Others: one for each 1 of max - min, from min on, but no more
+    ///            than 65536; Float has at least 1024.
+    /// Values     8 and 16 bits: (p - lo) times the quotient of 255 or 65535 by hi - lo (rounded first, so that hi
+    ///            itself may fall one short of the top), minus 128 or 32768 for Signed; limited to the type and
+    ///            truncated. An image of Signed pixels without a stretch is lowered all the same.
+    ///            32 bits: alike, but the factor is the whole quotient of 4294967295 by hi - lo, a coarse one.
+    ///            Float: (p - lo) times 1 / (hi - lo), not limited, plus the least positive normal number of the
+    ///            type. All in double.
+    /// NaN        stays; it counts as a pixel of the first bin and is neither min nor max. Infinities put all pixels
+    ///            into the first bin, so that nothing is stretched.
+    /// Fails      E_INVALIDARG "Normalize(): low, high must be in [0, 1] range" for low below 0 or high above 1, after
+    ///            a null pIImage; a low of 1 and more, high below low and NaN stretch nothing.
     virtual HRESULT Normalize(IPixmat2* pIImage, double low, double high, IPixmat2* pIOutImg,
                               IPixmat2** ppIOut) noexcept = 0;
     /// Whether two images have the same pixels. Images of different size, encoding or bits are not equal; strides may
@@ -142,6 +183,19 @@ struct IBasicOps2 : IDispatch {
     /// Fails      E_INVALIDARG for a null image; E_POINTER for a null pResult; E_NOTIMPL for images of one format with
     ///            other pixels: integers below 8 bits or of 64, BGRA, anything else.
     virtual HRESULT Equals(IPixmat2* pIImgA, IPixmat2* pIImgB, VARIANT_BOOL* pResult) noexcept = 0;
+    /// Splits an image into two classes at a limit that comes from its histogram.
+    /// Arguments  belowValue, aboveValue: as lowValue and highValue of Threshold. method: only
+    ///            ZELT_AutoThreshold_Basic_Global is there.
+    /// Values     as Threshold with both limits at T, so that a pixel equal to T stays. T starts in the middle of the
+    ///            occupied bins and moves to the middle between the means of the bins below it and from it on, until a
+    ///            step is not above 0.1. T COUNTS BINS: it is a pixel's value only where there is one bin for each value
+    ///            from 0 on. Integers truncate it, keeping the low bits.
+    /// Bins       (p - min) times a scale, truncated. The scale is 1 for ranges (max - min) of 127 to 65535; below,
+    ///            it is 128 / (range + 1), in whole numbers for 8 bits, with 128 bins, so that T may be far from any
+    ///            pixel; this also holds for the whole range of a type of 16 or of signed 8 bits. Above 65535 the
+    ///            scale is 0 and so is T. Ranges of 32 bits wrap, those of Float are rounded to the type.
+    /// NaN        stays, and counts as a pixel of the first bin.
+    /// Fails      E_INVALIDARG for another method.
     virtual HRESULT AutoThreshold(IPixmat2* pIImage, VARIANT belowValue, VARIANT aboveValue,
                                   ZELT_AutoThreshold_Method method, IPixmat2* pIOutImg,
                                   IPixmat2** ppIOut) noexcept = 0;
@@ -274,6 +328,7 @@ struct IBasicOps : IDispatch {
     /// "Requested output image of max has different size"
     virtual HRESULT MaxEx(IPixmat2* pIA, VARIANT b, IPixmatDescriptor* pIOutDescr,
                           IPixmat2** ppIOut) noexcept = 0;
+    /// As IBasicOps2::Abs, in place.
     virtual HRESULT Abs(IPixmat2* pIImage) noexcept = 0;
     /// "Requested output image of abs has different size"
     virtual HRESULT AbsEx(IPixmat2* pIImage, IPixmatDescriptor* pIOutDescr, IPixmat2** ppIOut) noexcept = 0;

@@ -1,7 +1,7 @@
 #include "arithmetic/kernels/thresholds.h"
 
-#include "arithmetic/kernels/binary.h"
 #include "arithmetic/kernels/pixel_bins.h"
+#include "arithmetic/kernels/plane.h"
 
 namespace Qor::Luxar::ZELT::Arithmetic {
 
@@ -10,8 +10,8 @@ std::optional<memory_2d> view_by_depth_class(const image_layout& layout, uint8_t
     constexpr pixel_type types[] = {pixel_type::unsigned_8, pixel_type::unsigned_16, pixel_type::unsigned_32,
                                     pixel_type::signed_8,   pixel_type::signed_16,   pixel_type::signed_32,
                                     pixel_type::float_32,   pixel_type::float_64};
-    const storage s = storage_of(layout);
-    if (static_cast<int>(s) >= real_count || layout.bits < 8) return {};
+    const storage s = real_storage_of(layout);
+    if (s == storage::none) return {};
     return memory_2d{types[static_cast<int>(s)],
                      layout.width,
                      layout.height,
