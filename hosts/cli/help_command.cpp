@@ -4,6 +4,7 @@
 #include "value_text.h"
 
 #include <iostream>
+#include <sstream>
 
 using namespace Qor;
 
@@ -74,9 +75,25 @@ void describe_argument(const argument_info& a, bool optional_marked)
         std::cout << std::string(26, ' ') << v.name << " = " << v.value << '\n';
 }
 
+/// The words of a text in lines of at most `width` letters, each with a margin on its left.
+std::string wrapped(const std::string& text, size_t margin, size_t width)
+{
+    std::istringstream words(text);
+    std::string lines, line, word;
+    while (words >> word) {
+        if (!line.empty() && margin + line.size() + 1 + word.size() > width) {
+            lines += std::string(margin, ' ') + line + '\n';
+            line.clear();
+        }
+        line += (line.empty() ? "" : " ") + word;
+    }
+    return lines + std::string(margin, ' ') + line + '\n';
+}
+
 void help_method(const facet& f, const method_info& m)
 {
     std::cout << signature(f, m) << "\n  " << m.help << '\n';
+    if (m.pixels) std::cout << "\nPixels:\n" << wrapped(m.pixels, 2, 100);
     if (m.kind == DISPATCH_PROPERTYGET) {
         bool writable = false;
         for (const method_info& other : f.table->methods)

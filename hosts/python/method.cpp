@@ -296,7 +296,8 @@ py::dict row_of(const method_plan& m)
                                                      : py::object(py::none())));
     }
     return py::dict("interface"_a = m.table.name, "name"_a = m.info.name, "help"_a = m.info.help,
-                    "kind"_a = static_cast<int>(m.info.kind), "arguments"_a = arguments);
+                    "pixels"_a = m.info.pixels, "kind"_a = static_cast<int>(m.info.kind),
+                    "arguments"_a = arguments);
 }
 
 PyObject* described_by(const char* function, PyObject* self)

@@ -225,7 +225,16 @@ struct method_row {
     std::array<argument_info, Arity> arguments;
     HRESULT (*call)(IUnknown*, VARIANT*) noexcept;
     std::array<unsigned char, 16> (*member)() noexcept;
+    const char* pixels = nullptr;
 };
+
+/// A row that also tells which pixels the method takes, and what comes out.
+template <size_t Arity>
+constexpr method_row<Arity> pixels(const char* types, method_row<Arity> row)
+{
+    row.pixels = types;
+    return row;
+}
 
 namespace detail {
 
@@ -249,7 +258,8 @@ constexpr auto row(uint16_t kind, const char* name, const char* help, Names... n
         kind,
         member<Member>::describe(std::array<argument_name, sizeof...(Names)>{names...}),
         &member<Member>::call,
-        &member_bytes<Member>};
+        &member_bytes<Member>,
+        nullptr};
 }
 
 } // namespace detail
@@ -307,7 +317,7 @@ private:
     template <size_t Arity>
     static method_info describe(const method_row<Arity>& row) noexcept
     {
-        method_info m{row.name, row.help, 0, row.kind, false, row.arguments, row.call, {}};
+        method_info m{row.name, row.help, row.pixels, 0, row.kind, false, row.arguments, row.call, {}};
         for (const argument_info& a : row.arguments)
             if (a.way == direction::in && std::string_view(a.type_name) == "IPixmat2") m.takes_image = true;
         const auto bytes = row.member();

@@ -6,9 +6,15 @@ namespace Qor {
 using namespace Luxar::ZELT;
 namespace {
 
+constexpr const char* ten_types =
+    "Signed and unsigned integers of up to 32 bits, float, double, RGB and BGR by channel; integers are cut "
+    "towards zero "
+    "and stop at the limits of their storage. The output has the type of the image.";
+
 constexpr auto filters2_rows = std::tuple(
-    method<&IFilters2::Gauss>("Gauss", "smooth; the cost does not depend on sigma", in("pIImage"),
-                              in("sigma"), opt("pIOut"), result("ppIPixmat")),
+    pixels(ten_types,
+           method<&IFilters2::Gauss>("Gauss", "smooth; the cost does not depend on sigma", in("pIImage"),
+                                     in("sigma"), opt("pIOut"), result("ppIPixmat"))),
     method<&IFilters2::Median>("Median", "median of a window", in("pIImage"), in("kernelWidth"),
                                in("kernelHeight"), opt("pIOut"), result("ppIPixmat")),
     method<&IFilters2::Min>("Min", "least pixel of a window", in("pIImage"), in("kernelWidth"),
@@ -17,12 +23,14 @@ constexpr auto filters2_rows = std::tuple(
                             in("kernelHeight"), opt("pIOut"), result("ppIPixmat")),
     method<&IFilters2::Average>("Average", "mean of a window", in("pIImage"), in("kernelWidth"),
                                 in("kernelHeight"), opt("pIOut"), result("ppIPixmat")),
-    method<&IFilters2::Convolve>("Convolve", "convolve with a kernel and its anchor", in("pIImage"),
-                                 in("kernel"), in("kx"), in("ky"), opt("pIOut"), result("ppIPixmat")),
-    method<&IFilters2::Sobel>("Sobel", "magnitude of the gradient, by Sobel's kernels", in("pIImage"),
-                              opt("pIOut"), result("ppIPixmat")),
-    method<&IFilters2::Prewitt>("Prewitt", "magnitude of the gradient, by Prewitt's kernels", in("pIImage"),
-                                opt("pIOut"), result("ppIPixmat")),
+    pixels(ten_types,
+           method<&IFilters2::Convolve>("Convolve", "convolve with a kernel and its anchor", in("pIImage"),
+                                        in("kernel"), in("kx"), in("ky"), opt("pIOut"), result("ppIPixmat"))),
+    pixels(ten_types, method<&IFilters2::Sobel>("Sobel", "magnitude of the gradient, by Sobel's kernels",
+                                                in("pIImage"), opt("pIOut"), result("ppIPixmat"))),
+    pixels(ten_types,
+           method<&IFilters2::Prewitt>("Prewitt", "magnitude of the gradient, by Prewitt's kernels",
+                                       in("pIImage"), opt("pIOut"), result("ppIPixmat"))),
     method<&IFilters2::HanningWindow>("HanningWindow", "multiply with a Hann window", in("pIImage"),
                                       opt("pIOut"), result("ppIPixmat")),
     method<&IFilters2::HammingWindow>("HammingWindow", "multiply with a Hamming window", in("pIImage"),
@@ -31,16 +39,18 @@ constexpr auto filters2_rows = std::tuple(
                               opt("pIDstPoint"), opt("Value", 0.0), opt("maxWidth")),
     method<&IFilters2::TaperEx>("TaperEx", "Taper into a new image", in("pIImage"), in("width"), in("height"),
                                 opt("pIDstPoint"), opt("Value", 0.0), opt("maxWidth"), result("ppIPixmat")),
-    method<&IFilters2::GaussDerivative>("GaussDerivative", "magnitude of the gradient of the smoothed image",
-                                        in("pIImage"), in("sigma"), opt("pIOut"), result("ppIPixmat")),
-    method<&IFilters2::LaplacianGaussian>("LaplacianGaussian",
-                                          "magnitude of the second differences of the smoothed image",
-                                          in("pIImage"), in("sigma"), opt("pIOut"), result("ppIPixmat")),
-    method<&IFilters2::SDGDGaussian>("SDGDGaussian",
-                                     "second derivative along the gradient of the smoothed image",
-                                     in("pIImage"), in("sigma"), opt("pIOut"), result("ppIPixmat")),
-    method<&IFilters2::Derivative>("Derivative", "magnitude of the gradient, by differences of neighbours",
-                                   in("pIImage"), opt("pIOut"), result("ppIPixmat")),
+    pixels(ten_types, method<&IFilters2::GaussDerivative>(
+                          "GaussDerivative", "magnitude of the gradient of the smoothed image", in("pIImage"),
+                          in("sigma"), opt("pIOut"), result("ppIPixmat"))),
+    pixels(ten_types, method<&IFilters2::LaplacianGaussian>(
+                          "LaplacianGaussian", "magnitude of the second differences of the smoothed image",
+                          in("pIImage"), in("sigma"), opt("pIOut"), result("ppIPixmat"))),
+    pixels(ten_types, method<&IFilters2::SDGDGaussian>(
+                          "SDGDGaussian", "second derivative along the gradient of the smoothed image",
+                          in("pIImage"), in("sigma"), opt("pIOut"), result("ppIPixmat"))),
+    pixels(ten_types, method<&IFilters2::Derivative>(
+                          "Derivative", "magnitude of the gradient, by differences of neighbours",
+                          in("pIImage"), opt("pIOut"), result("ppIPixmat"))),
     method<&IFilters2::Bilateral>("Bilateral", "smooth, but keep edges: mean of near and alike pixels",
                                   in("pIImage"), in("sigma_dist"), in("sigma_brightness"), opt("pIOut"),
                                   result("ppIPixmat")),

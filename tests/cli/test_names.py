@@ -27,6 +27,11 @@ def test_every_listed_method_has_help(zelt):
         assert zelt("help", name.lower()).startswith(name)
 
 
+def test_help_tells_the_type_rules(zelt):
+    assert "Integers of up to 32 bits are combined in 32 bits" in " ".join(zelt("help", "Basic.Add").split())
+    assert "RGB and BGR by channel" in " ".join(zelt("help", "Filters.Convolve").split())
+
+
 def test_help_tells_arguments_defaults_and_values(zelt):
     text = " ".join(zelt("help", "Statistics.FindLocalMaxima").split())
     assert "FindLocalMaxima(pIImage, [nMaxima], [radius], [peakSelectionNeighborhoodSize], [pIRect], [orderSpec]) -> IPeaks" in text

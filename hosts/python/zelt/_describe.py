@@ -1,6 +1,7 @@
 """Signatures and documentation from the rows of the interface tables."""
 
 import inspect
+import textwrap
 
 VT_R4, VT_R8, VT_BSTR, VT_BOOL, VT_VARIANT, VT_ARRAY = 4, 5, 8, 11, 12, 0x2000
 PROPERTY_GET = 2
@@ -71,6 +72,8 @@ def signature(row):
 
 def documentation(row):
     lines = [row["help"]]
+    if row["pixels"]:
+        lines += ["", "Pixels:"] + textwrap.wrap(row["pixels"], 96, initial_indent="    ", subsequent_indent="    ")
     described = [a for a in row["arguments"] if not (row["kind"] == PROPERTY_GET and a["way"] == "out")]
     for title, way in (("Arguments", "in"), ("Results", "out")):
         chosen = [a for a in described if a["way"] == way]

@@ -37,6 +37,8 @@ struct argument_info {
 struct method_info {
     const char* name;
     const char* help;
+    const char*
+        pixels; ///< accepted pixel types and the type of the result; null where the table does not tell
     DISPID id;
     uint16_t kind; ///< DISPATCH_METHOD, DISPATCH_PROPERTYGET or DISPATCH_PROPERTYPUT
     bool takes_image;
