@@ -146,6 +146,47 @@ TEST(FlattenDouble, FollowsTheTableFor8BitExposures)
     for_types<int16_t, int32_t>([]<class T>(pixel<T>) { sweep_all_rows<T, uint8_t, int16_t>(); });
 }
 
+/// Rows are looked at in parts: with and without saturated pixels, with and without large gains.
+template <class T, class G>
+void merge_long_rows(G odd_gain)
+{
+    const size s{600, 2};
+    test_image<uint16_t> l(s);
+    const auto h = random_image<uint16_t>(s, memory_layout::packed, 2);
+    const auto dark = random_image<int16_t>(s, memory_layout::packed, 3);
+    test_image<G> gain(s);
+    gain.fill([&](int x, int y) {
+        return static_cast<G>(h.at(x, y) % 5000 * (std::is_integral_v<G> ? 10 : 0.0005));
+    });
+    l.fill([&](int x, int y) { return uint16_t(h.at(599 - x, y) / 2); });
+    for (const int x : {127, 256, 257, 599}) l.set(x, x % 2, 65535);
+    for (const int x : {0, 130, 260, 598}) gain.set(x, x % 2, odd_gain);
+    const auto expected = [&](int x, int y) {
+        return merged_gain<T>(l.at(x, y), h.at(x, y), dark.at(x, y), gain.at(x, y), 65535, 1.5, 1);
+    };
+    for_each_level([&](level) {
+        test_image<T> dst(s);
+        flatten_double(image_of(dst), image_of(l), image_of(h), 1.5, image_of(dark), image_of(gain), 1,
+                       nullptr);
+        expect_equal(dst, expected);
+        if (sizeof(T) != sizeof(uint16_t)) return;
+        test_image<uint16_t> same = l;
+        auto in_place = image_of(same);
+        in_place.layout.encoding = PixmatEncoding_Signed;
+        flatten_double(in_place, image_of(same), image_of(h), 1.5, image_of(dark), image_of(gain), 1,
+                       nullptr);
+        expect_equal(same, [&](int x, int y) { return static_cast<uint16_t>(expected(x, y)); });
+    });
+}
+
+TEST(FlattenDouble, ChangesItsWayAlongARow)
+{
+    for_types<int16_t, int32_t>([]<class T>(pixel<T>) {
+        for (const float odd : {16384.0f, -1e30f, HUGE_VALF, NAN}) merge_long_rows<T, float>(odd);
+        merge_long_rows<T, uint16_t>(65535);
+    });
+}
+
 TEST(FlattenDouble, NeedsAShortExposureOrADark)
 {
     const test_image<uint16_t> l({4, 4});

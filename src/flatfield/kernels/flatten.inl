@@ -114,19 +114,37 @@ struct multiply_small_float {
     }
 };
 
-template <class T, class Row>
-bool all_small(int64_t begin, int64_t end, Row gain)
+template <class T, class Count, class Row>
+bool all_small(Count n, Row gain)
 {
-    // The bits of positive floats are ordered like their values. A difference is negative above the limit,
-    // NaN too, and the bits themselves are for negative floats.
+    const int64_t end = n;
+    // The bits of positive floats are ordered like their values. Those of a NaN lie above the limit, and so do those
+    // of negative floats as they are.
     constexpr bool positive_only = T(-1) > T(0);
     constexpr uint32_t limit = __builtin_bit_cast(uint32_t, small_gain) - 1;
+    const auto bits_of = [=](int64_t x) {
+        const auto bits = __builtin_bit_cast(uint32_t, static_cast<float>(gain[x]));
+        return positive_only ? bits : bits & 0x7FFFFFFF;
+    };
+#if defined(__SSE2__) && !defined(__SSE4_1__)
+    // No maximum of these here; but a difference is negative above the limit.
     uint32_t signs = 0;
-    for (int64_t x = begin; x < end; ++x) {
-        const uint32_t bits = gain[x];
-        signs |= positive_only ? bits | (limit - bits) : limit - (bits & 0x7FFFFFFF);
-    }
+    for (int64_t x = 0; x < end; ++x) signs |= bits_of(x) | (limit - bits_of(x));
     return signs >> 31 == 0;
+#else
+    uint32_t most = 0;
+    for (int64_t x = 0; x < end; ++x) most = bits_of(x) > most ? bits_of(x) : most;
+    return most <= limit;
+#endif
+}
+
+template <class T, class S, class D, class Count, class Dst, class Src, class Dark, class Gain>
+void multiply_float_piece(Count n, Dst dst, Src src, Dark dark, Gain gain)
+{
+    if (all_small<T>(n, gain))
+        each_pixel(n, multiply_small_float<T, S, D>{}, dst, src, dark, gain);
+    else
+        each_pixel(n, multiply_float<T, S, D>{}, dst, src, dark, gain);
 }
 
 // The rows.
@@ -134,14 +152,14 @@ bool all_small(int64_t begin, int64_t end, Row gain)
 template <template <class> class Row, class T, class S, class D>
 void subtract_row(const row_job& job, int64_t y)
 {
-    each_pixel(0, job.width, subtract<T, S, D>{}, row_of<Row, T>(job.dst, y), row_of<Row, S>(job.src, y),
+    each_pixel(job.width, subtract<T, S, D>{}, row_of<Row, T>(job.dst, y), row_of<Row, S>(job.src, y),
                row_of<Row, D>(job.dark, y));
 }
 
 template <template <class> class Row, class T, class S, class D, class G>
 void multiply_fixed_row(const row_job& job, int64_t y)
 {
-    each_pixel(0, job.width, multiply_fixed<T, S, D, G>{job.shift}, row_of<Row, T>(job.dst, y),
+    each_pixel(job.width, multiply_fixed<T, S, D, G>{job.shift}, row_of<Row, T>(job.dst, y),
                row_of<Row, S>(job.src, y), row_of<Row, D>(job.dark, y), row_of<Row, G>(job.gain, y));
 }
 
@@ -152,19 +170,13 @@ void multiply_float_row(const row_job& job, int64_t y)
     const auto src = row_of<Row, S>(job.src, y);
     const auto dark = row_of<Row, D>(job.dark, y);
     const auto gain = row_of<Row, float>(job.gain, y);
-    const int64_t width = job.width;
-    if constexpr (!is_same<Row<T>, contiguous_row<T>>::value || is_real<T> || is_same<T, uint32_t>::value) {
-        each_pixel(0, width, multiply_float<T, S, D>{}, dst, src, dark, gain);
-    } else {
-        constexpr int64_t block = 1024; // its gains are still in the first-level cache the second time
-        for (int64_t begin = 0; begin < width; begin += block) {
-            const int64_t end = width - begin < block ? width : begin + block;
-            if (all_small<T>(begin, end, row_of<Row, uint32_t>(job.gain, y)))
-                each_pixel(begin, end, multiply_small_float<T, S, D>{}, dst, src, dark, gain);
-            else
-                each_pixel(begin, end, multiply_float<T, S, D>{}, dst, src, dark, gain);
-        }
-    }
+    if constexpr (!is_same<Row<T>, contiguous_row<T>>::value || is_real<T> || is_same<T, uint32_t>::value)
+        each_pixel(job.width, multiply_float<T, S, D>{}, dst, src, dark, gain);
+    else
+        each_piece(job.width, [=](int64_t begin, auto n) {
+            multiply_float_piece<T, S, D>(n, row_from(dst, begin), row_from(src, begin),
+                                          row_from(dark, begin), row_from(gain, begin));
+        });
 }
 
 template <template <class> class Row, class D, class... T>

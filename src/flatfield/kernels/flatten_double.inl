@@ -6,15 +6,15 @@
 
 namespace Qor::Luxar::ZELT::ZELT_LEVEL::flatfield {
 
-/// Toward zero, limited to the type; NaN gives 0.
+/// Toward zero, limited to the type; NaN gives 0. Without a branch, so that it is vectorised.
 template <class T>
 T limited(double v)
 {
-    constexpr int32_t high = sizeof(T) == 2 ? 0x7FFF : 0x7FFFFFFF;
-    constexpr int32_t low = -high - 1;
-    if (v < low) return static_cast<T>(low);
-    if (v >= high) return static_cast<T>(high);
-    return v == v ? static_cast<T>(v) : T{0};
+    constexpr double high = sizeof(T) == 2 ? 0x1p15 - 1 : 0x1p31 - 1;
+    constexpr double low = -high - 1;
+    v = v == v ? v : 0;
+    v = v < low ? low : v;
+    return static_cast<T>(static_cast<int32_t>(v < high ? v : high));
 }
 
 /// Limited to a 16-bit destination, as it is for a 32-bit one.
@@ -27,15 +27,16 @@ T fitted(int32_t v)
         return v;
 }
 
+// The operations: what a pixel becomes where the long exposure is saturated, and where it is below.
+
 /// No references.
 template <class T, class S>
 struct merge_raw {
-    uint32_t saturated;
     double ratio;
 
-    T operator()(S l, S h) const
+    T saturated(S l, S) const { return limited<T>(static_cast<double>(l) * ratio); }
+    T below(S, S h) const
     {
-        if (l >= saturated) return limited<T>(static_cast<double>(l) * ratio);
         // Deliberately a threshold in 16 bits.
         if constexpr (sizeof(T) == 2)
             return h < 32768 ? -32768 : 32767;
@@ -46,54 +47,61 @@ struct merge_raw {
 
 template <class T, class S, class D>
 struct merge_dark {
-    uint32_t saturated;
     double ratio;
 
-    T operator()(S l, S h, D d) const
+    T saturated(S l, S, D d) const
     {
-        if (l >= saturated)
-            return limited<T>(static_cast<double>(static_cast<int32_t>(difference(l, d))) * ratio);
-        return fitted<T>(static_cast<int32_t>(difference(h, d)));
+        return limited<T>(static_cast<double>(static_cast<int32_t>(difference(l, d))) * ratio);
     }
+    T below(S, S h, D d) const { return fitted<T>(static_cast<int32_t>(difference(h, d))); }
 };
 
 template <class T, class S, class D>
 struct merge_float_gain {
-    uint32_t saturated;
     double ratio;
 
-    T operator()(S l, S h, D d, float g) const
+    T saturated(S, S h, D d, float g) const
     {
-        if (l >= saturated)
-            return limited<T>(static_cast<double>(static_cast<int32_t>(difference(h, d))) * ratio *
-                              static_cast<double>(g));
-        const float product = static_cast<float>(static_cast<int32_t>(difference(l, d))) * g;
+        return limited<T>(static_cast<double>(static_cast<int32_t>(difference(h, d))) * ratio *
+                          static_cast<double>(g));
+    }
+    T below(S l, S, D d, float g) const
+    {
+        const float product = multiply_float<int32_t, S, D>::product(l, d, g);
         if constexpr (sizeof(T) == 2) {
             // The limits come before the conversion, so that infinite gains end at them.
             const float sum = product + 0.5f;
             if (sum >= 32767.0f) return 32767;
             if (sum < -32768.0f) return -32768;
-            return static_cast<T>(rounded(product));
-        } else {
-            return static_cast<T>(rounded(product));
         }
+        return static_cast<T>(rounded(product));
+    }
+
+    template <class Count, class Long, class Short, class Dark, class Gain>
+    bool has_small_gain(Count n, Long, Short, Dark, Gain gain) const
+    {
+        return all_small<int32_t>(n, gain);
+    }
+    T below_with_small_gain(S l, S, D d, float g) const
+    {
+        return fitted<T>(multiply_small_float<int32_t, S, D>{}(l, d, g));
     }
 };
 
 template <class T, class S, class D>
 struct merge_fixed_gain {
-    uint32_t saturated;
     double ratio;
     uint32_t shift;
 
-    T operator()(S l, S h, D d, uint16_t g) const
+    T saturated(S, S h, D d, uint16_t g) const
     {
-        if (l >= saturated) {
-            // A negative product comes out of the logical shift as a large positive number.
-            const double product =
-                static_cast<double>(static_cast<int32_t>(difference(h, d))) * ratio * static_cast<double>(g);
-            return limited<T>(static_cast<double>(static_cast<uint32_t>(truncated(product)) >> shift));
-        }
+        // A negative product comes out of the logical shift as a large positive number.
+        const double product =
+            static_cast<double>(static_cast<int32_t>(difference(h, d))) * ratio * static_cast<double>(g);
+        return limited<T>(static_cast<double>(static_cast<uint32_t>(truncated(product)) >> shift));
+    }
+    T below(S l, S, D d, uint16_t g) const
+    {
         return fitted<T>(static_cast<int32_t>((difference(l, d) * g) >> shift));
     }
 };
@@ -116,41 +124,90 @@ struct merge_lanes {
     }
 };
 
+template <class Count, class Row, class S>
+bool reaches(Count n, Row row, S level)
+{
+    const int64_t end = n;
+    S most = 0;
+    for (int64_t x = 0; x < end; ++x) most = row[x] > most ? static_cast<S>(row[x]) : most;
+    return most >= level;
+}
+
+/// dst = below(pixels...) for n pixels that are none of them saturated.
+template <class Count, class Operation, class Dst, class... Sources>
+void merge_below(Count n, Operation operation, Dst dst, Sources... sources)
+{
+    if constexpr (requires { &Operation::below_with_small_gain; })
+        if (operation.has_small_gain(n, sources...)) {
+            const auto below = [=](auto... pixels) { return operation.below_with_small_gain(pixels...); };
+            return each_pixel(n, below, dst, sources...);
+        }
+    const auto below = [=](auto... pixels) { return operation.below(pixels...); };
+    each_pixel(n, below, dst, sources...);
+}
+
+/// Saturated pixels of a frame lie together: most pieces of a row have none. In the others each pixel is computed
+/// in both ways, since loops without a choice are vectorised.
+template <class T, class Count, class S, class Operation, class Dst, class Long, class... Others>
+void merge_piece(Count n, S level, Operation operation, Dst dst, Long l, Others... others)
+{
+    if (!reaches(n, l, level)) return merge_below(n, operation, dst, l, others...);
+    T above[piece], below[piece];
+    const contiguous_row<T> above_row{reinterpret_cast<uint8_t*>(above)};
+    const contiguous_row<T> below_row{reinterpret_cast<uint8_t*>(below)};
+    const auto saturated = [=](auto... pixels) { return operation.saturated(pixels...); };
+    each_pixel(n, saturated, above_row, l, others...);
+    merge_below(n, operation, below_row, l, others...);
+    const auto choose = [=](S at, T where_saturated, T elsewhere) {
+        return at >= level ? where_saturated : elsewhere;
+    };
+    each_pixel(n, choose, dst, l, above_row, below_row);
+}
+
+template <template <class> class Row, class T, class S, class Operation, class... References>
+void merge_row(const row_job& job, int64_t y, Operation operation, References... references)
+{
+    const auto dst = row_of<Row, T>(job.dst, y);
+    const auto l = row_of<Row, S>(job.src, y);
+    const auto h = row_of<Row, S>(job.brief, y);
+    const auto level = static_cast<S>(job.saturated);
+    each_piece(job.width, [=](int64_t begin, auto n) {
+        merge_piece<T>(n, level, operation, row_from(dst, begin), row_from(l, begin), row_from(h, begin),
+                       row_from(references, begin)...);
+    });
+}
+
 template <template <class> class Row, class T, class S>
 void merge_raw_row(const row_job& job, int64_t y)
 {
-    each_pixel(0, job.width, merge_raw<T, S>{job.saturated, job.ratio}, row_of<Row, T>(job.dst, y),
-               row_of<Row, S>(job.src, y), row_of<Row, S>(job.brief, y));
+    merge_row<Row, T, S>(job, y, merge_raw<T, S>{job.ratio});
 }
 
 template <template <class> class Row, class T, class S, class D>
 void merge_dark_row(const row_job& job, int64_t y)
 {
-    each_pixel(0, job.width, merge_dark<T, S, D>{job.saturated, job.ratio}, row_of<Row, T>(job.dst, y),
-               row_of<Row, S>(job.src, y), row_of<Row, S>(job.brief, y), row_of<Row, D>(job.dark, y));
+    merge_row<Row, T, S>(job, y, merge_dark<T, S, D>{job.ratio}, row_of<Row, D>(job.dark, y));
 }
 
 template <template <class> class Row, class T, class S, class D>
 void merge_float_gain_row(const row_job& job, int64_t y)
 {
-    each_pixel(0, job.width, merge_float_gain<T, S, D>{job.saturated, job.ratio}, row_of<Row, T>(job.dst, y),
-               row_of<Row, S>(job.src, y), row_of<Row, S>(job.brief, y), row_of<Row, D>(job.dark, y),
-               row_of<Row, float>(job.gain, y));
+    merge_row<Row, T, S>(job, y, merge_float_gain<T, S, D>{job.ratio}, row_of<Row, D>(job.dark, y),
+                         row_of<Row, float>(job.gain, y));
 }
 
 template <template <class> class Row, class T, class S, class D>
 void merge_fixed_gain_row(const row_job& job, int64_t y)
 {
-    each_pixel(0, job.width, merge_fixed_gain<T, S, D>{job.saturated, job.ratio, job.shift},
-               row_of<Row, T>(job.dst, y), row_of<Row, S>(job.src, y), row_of<Row, S>(job.brief, y),
-               row_of<Row, D>(job.dark, y), row_of<Row, uint16_t>(job.gain, y));
+    merge_row<Row, T, S>(job, y, merge_fixed_gain<T, S, D>{job.ratio, job.shift}, row_of<Row, D>(job.dark, y),
+                         row_of<Row, uint16_t>(job.gain, y));
 }
 
 template <template <class> class Row>
 void merge_lanes_row(const row_job& job, int64_t y)
 {
     const merge_lanes lanes{static_cast<int16_t>(job.saturated), job.lane_ratio, job.left_shift};
-    each_pixel(0, job.width, lanes, row_of<Row, int16_t>(job.dst, y), row_of<Row, uint16_t>(job.src, y),
+    each_pixel(job.width, lanes, row_of<Row, int16_t>(job.dst, y), row_of<Row, uint16_t>(job.src, y),
                row_of<Row, uint16_t>(job.brief, y), row_of<Row, int16_t>(job.dark, y),
                row_of<Row, uint16_t>(job.gain, y));
 }

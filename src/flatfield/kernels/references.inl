@@ -9,7 +9,7 @@ template <class T, class Dst, class Src>
 void subtract_offset(Dst dst, Src src, T offset)
 {
     const auto subtract = [=](T p) { return static_cast<T>(p - offset); };
-    for (int32_t y = 0; y < src.height; ++y) each_pixel(0, src.width, subtract, dst[y], src[y]);
+    for (int32_t y = 0; y < src.height; ++y) each_pixel(src.width, subtract, dst[y], src[y]);
 }
 
 /// Row after row, in a Sum: doubles are added one by one, integers are exact in 64 bits.
@@ -37,7 +37,7 @@ void real_gain(Dst dst, Src src, double norm)
         const double gain = norm / p;
         return static_cast<T>(p > 0 ? (highest < gain ? highest : gain) : highest);
     };
-    for (int32_t y = 0; y < src.height; ++y) each_pixel(0, src.width, gain_of, dst[y], src[y]);
+    for (int32_t y = 0; y < src.height; ++y) each_pixel(src.width, gain_of, dst[y], src[y]);
 }
 
 /// numerator: the norm times the range of T. unit: what a pixel counts, a power of two or its negative.
@@ -50,7 +50,7 @@ void fixed_gain(Dst dst, Src src, double numerator, double unit)
         const double stored = __builtin_floor((p == 0 || highest < gain ? highest : gain) + 0.5);
         return stored >= -0x1p63 ? static_cast<T>(static_cast<int64_t>(stored)) : T{0};
     };
-    for (int32_t y = 0; y < src.height; ++y) each_pixel(0, src.width, gain_of, dst[y], src[y]);
+    for (int32_t y = 0; y < src.height; ++y) each_pixel(src.width, gain_of, dst[y], src[y]);
 }
 
 } // namespace Qor::Luxar::ZELT::ZELT_LEVEL::flatfield
