@@ -232,6 +232,11 @@ TEST_F(Compositing2, CombineBlends)
               S_OK);
     EXPECT_EQ(layout_of(result), packed_layout(4, 3, 12, U));
     EXPECT_EQ(pixel_of<uint16_t>(result), 65535) << "the range is that of the storage";
+    const auto whole_mask = image<int16_t>(S, 32767);
+    ASSERT_EQ(facet->Combine(image<int16_t>(S, 100).get(), image<int16_t>(S, 1000).get(), whole_mask.get(),
+                             nullptr, result.put()),
+              S_OK);
+    EXPECT_EQ(pixel_of<int16_t>(result), 1000) << "a whole weight leaves nothing of the base";
     EXPECT_EQ(facet->Combine(u8.get(), other.get(), mask.get(), other.get(), nullptr), E_POINTER);
     EXPECT_EQ(pixel_of<uint8_t>(other), 90);
 }

@@ -17,7 +17,6 @@ double weight_of(T p)
 {
     using limits = std::numeric_limits<T>;
     if constexpr (std::is_floating_point_v<T>) return static_cast<double>(p);
-    if (std::is_same_v<T, int16_t>) return (p + 32768.0) * 1.5259021896692422e-5;
     const double range = static_cast<double>(limits::max()) - static_cast<double>(limits::min());
     return (static_cast<double>(p) - static_cast<double>(limits::min())) * (1.0 / range);
 }

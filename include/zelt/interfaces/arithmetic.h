@@ -214,8 +214,7 @@ struct IBasicOps2 : IDispatch {
     /// Pixels     real; all images have one size, encoding and bits. A new output has the descriptor of pIBaseImage.
     /// Values     w is the mask mapped to 0 to 1 over the range of its storage (not that of its nominal bits): p
     ///            times the reciprocal of the highest value of an Unsigned type, p minus the lowest value times the
-    ///            reciprocal of the range of a Signed one. For Signed of 16 bits that reciprocal is
-    ///            1.5259021896692422e-5, so that the highest weight falls just short of 1. Float is its own weight,
+    ///            reciprocal of the range of a Signed one, so that the highest weight is 1. Float is its own weight,
     ///            also outside 0 to 1.
     /// In place   the output may be any of the inputs.
     /// Fails      in this order: E_INVALIDARG for a null image; "all input images must be of the same format";

@@ -12,7 +12,7 @@ mask_range mask_range_of(storage mask) noexcept
     case storage::u16: return {0, 1.0 / 65535.0};
     case storage::u32: return {0, 1.0 / 4294967295.0};
     case storage::i8: return {-128.0, 1.0 / 255.0};
-    case storage::i16: return {-32768.0, 1.5259021896692422e-5}; // deliberately a little less than 1 / 65535
+    case storage::i16: return {-32768.0, 1.0 / 65535.0};
     case storage::i32: return {-2147483648.0, 1.0 / 4294967295.0};
     default: return {0, 1};
     }
