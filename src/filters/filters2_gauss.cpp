@@ -44,7 +44,8 @@ HRESULT CFilters2::LaplacianGaussian(IPixmat2* pIImage, double sigma, IPixmat2* 
     });
 }
 
-HRESULT CFilters2::SDGDGaussian(IPixmat2* pIImage, double sigma, IPixmat2* pIOut, IPixmat2** ppIPixmat) noexcept
+HRESULT CFilters2::SDGDGaussian(IPixmat2* pIImage, double sigma, IPixmat2* pIOut,
+                                IPixmat2** ppIPixmat) noexcept
 {
     return filtered(pIImage, pIOut, ppIPixmat, [&](const memory_2d& src, const memory_2d& dst) {
         Filters::sdgd_gaussian(src, sigma, dst);
