@@ -1,28 +1,28 @@
 #include "arithmetic/kernels/modulate.h"
 
 #include "arithmetic/kernels/blend.h"
+#include "arithmetic/kernels/functions_levels.h"
 #include "arithmetic/kernels/real_blocks.h"
 
-#include <sleef.h>
+#include <cstddef>
 
 namespace Qor::Luxar::ZELT::Arithmetic {
 namespace {
 
 constexpr int byte_values = 256;
 
-/// The mathematical library's own pow differs in last bits between processors.
-double power(double base, double exponent) { return Sleef_cinz_powd1_u10purec(base, exponent); }
+/// Each value to a power, with the same bits on every processor.
+void raise(double* values, int32_t count, double exponent)
+{
+    auto* const bytes = reinterpret_cast<uint8_t*>(values);
+    functions_level().power[1](bytes, bytes, count, exponent);
+}
 
 /// From mask pixels, given as numbers, to what colours are multiplied with.
 void to_factors(double* values, int32_t count, mask_range range, double weight)
 {
     for (int32_t i = 0; i < count; ++i) values[i] = (values[i] - range.lowest) * range.reciprocal;
-    int32_t i = 0;
-#ifdef __SSE2__
-    for (; i + 2 <= count; i += 2) // the same bits as one by one
-        _mm_storeu_pd(values + i, Sleef_cinz_powd2_u10sse2(_mm_loadu_pd(values + i), _mm_set1_pd(weight)));
-#endif
-    for (; i < count; ++i) values[i] = power(values[i], weight);
+    raise(values, count, weight);
 }
 
 /// Truncated, low bits kept; 0 for NaN and beyond 64 bits.
@@ -142,7 +142,9 @@ outcome modulate(const image& colours, const image& mask, double weight, const i
           mask_range_of(type),
           weight,
           {}};
-    for (int c = 0; c < byte_values; ++c) j.shades[c] = power(c / 255.0, 1.0 - weight) * 255.0;
+    for (int c = 0; c < byte_values; ++c) j.shades[c] = c / 255.0;
+    raise(j.shades, byte_values, 1.0 - weight);
+    for (double& shade : j.shades) shade *= 255.0;
 
     // A table costs as much as so many pixels.
     const int64_t pixels = int64_t{extent.width} * extent.height;
