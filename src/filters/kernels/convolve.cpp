@@ -11,71 +11,106 @@ namespace {
 /// Output rows that are computed together.
 constexpr int32_t rows_at_once = 4;
 
-/// A convolution, and what its workers need for themselves.
+struct convolve_operands {
+    memory_2d src;
+    kernel_view kernel;
+    coordinate<int32_t> anchor;
+    memory_2d dst;
+};
+
+bool is_3x3(const kernel_view& k) { return k.width == 3 && k.height == 3; }
+
+/// A convolution over source rows of E, and what its workers need for themselves.
+template <class E>
 class convolution {
 public:
-    convolution(const memory_2d& src, const kernel_view& kernel, coordinate<int32_t> anchor,
-                const memory_2d& dst, int workers)
-        : table_(convolve_level()), type_(table_index_of(element_of(src.type))), kernel_(kernel),
-          anchor_(anchor), height_(dst.height), channels_(channels_of(src.type)),
-          elements_(int64_t{dst.width} * channels_)
+    convolution(const convolve_operands& o, const convolve_loops<E>& loops, int workers)
+        : o_(o), sum_(is_3x3(o.kernel) ? loops.sum_3x3 : loops.sum), channels_(channels_of(o.src.type)),
+          contiguous_(o.src.x_stride == channels_ * GetPixmatBits(element_of(o.src.type)) / 8)
     {
-        if (kernel.width == 0 || kernel.height == 0) kernel_ = {kernel.values, 0, 0};
-        const int64_t columns = std::max<int64_t>(kernel_.width, 1); // a kernel without any still gets rows
-        const padded_source rows = padded(src, columns - 1 - anchor.x, anchor.x);
+        if (o_.kernel.width == 0 || o_.kernel.height == 0) o_.kernel = {o.kernel.values, 0, 0};
+        const int64_t columns = std::max<int64_t>(o_.kernel.width, 1); // a kernel without any still gets rows
+        const padded_source rows = padded(o_.src, columns - 1 - o_.anchor.x, o_.anchor.x);
         const int64_t at_once =
-            std::clamp<int64_t>(int64_t{kernel_.height} + rows_at_once - 1, 1, src.height);
+            std::clamp<int64_t>(int64_t{o_.kernel.height} + rows_at_once - 1, 1, o_.src.height);
         workers_.reserve(static_cast<size_t>(workers));
         for (int i = 0; i < workers; ++i)
-            workers_.push_back(
-                {row_ring<double>(rows, table_.load[type_], at_once, convolve_slack),
-                 std::vector<const double*>(static_cast<size_t>(kernel_.height + rows_at_once)),
-                 std::vector<double>(static_cast<size_t>(rows_at_once * sum_length())), output_rows(dst)});
+            workers_.push_back({row_ring<E>(rows, loops.load, at_once, convolve_slack),
+                                std::vector<const E*>(static_cast<size_t>(o_.kernel.height) + rows_at_once),
+                                std::vector<output_rows>(rows_at_once, output_rows(o_.dst))});
     }
 
     void compute(int32_t block, int worker)
     {
+        scratch& own = workers_[static_cast<size_t>(worker)];
         const int32_t top = block * rows_at_once;
-        const int32_t count = std::min(rows_at_once, height_ - top);
-        if (count == rows_at_once) return compute_rows(top, count, workers_[static_cast<size_t>(worker)]);
-        for (int32_t y = top; y < top + count; ++y) compute_rows(y, 1, workers_[static_cast<size_t>(worker)]);
+        const int32_t count = std::min(rows_at_once, o_.dst.height - top);
+        if (count == rows_at_once) return compute_rows(top, count, own);
+        for (int32_t y = top; y < top + count; ++y) compute_rows(y, 1, own);
     }
 
 private:
     struct scratch {
-        row_ring<double> source;
-        std::vector<const double*> rows;
-        std::vector<double> sums;
-        output_rows out;
+        row_ring<E> source;
+        std::vector<const E*> rows;
+        std::vector<output_rows> out;
     };
-
-    int64_t sum_length() const { return elements_ + convolve_slack; }
 
     void compute_rows(int32_t top, int32_t count, scratch& own)
     {
         const int64_t lowest = int64_t{top} + count - 1;
-        for (int64_t i = 0; i < kernel_.height + count - 1; ++i)
-            own.rows[static_cast<size_t>(i)] = own.source[lowest + anchor_.y - i];
-        double* sums[rows_at_once];
-        for (int32_t i = 0; i < count; ++i) sums[i] = own.sums.data() + i * sum_length();
-        table_.sum(
-            {own.rows.data(), count, kernel_.values, kernel_.width, kernel_.height, channels_, elements_},
-            sums);
-        for (int32_t i = 0; i < count; ++i) {
-            table_.store[type_](sums[i], elements_, own.out.begin(lowest - i));
-            own.out.end(lowest - i);
-        }
+        for (int64_t i = 0; i < o_.kernel.height + count - 1; ++i)
+            own.rows[static_cast<size_t>(i)] = own.source[lowest + o_.anchor.y - i];
+        uint8_t* to[rows_at_once];
+        for (int32_t i = 0; i < count; ++i) to[i] = own.out[static_cast<size_t>(i)].begin(lowest - i);
+
+        const int64_t next = lowest + o_.anchor.y + 1;
+        const bool known = contiguous_ && next >= 0 && next + rows_at_once <= o_.src.height;
+        sum_({.rows = own.rows.data(),
+              .output_rows = count,
+              .kernel = o_.kernel.values,
+              .kernel_width = o_.kernel.width,
+              .kernel_height = o_.kernel.height,
+              .step = channels_,
+              .elements = int64_t{o_.dst.width} * channels_,
+              .next_row = known ? first_pixel(o_.src) + next * o_.src.y_stride : nullptr,
+              .next_stride = o_.src.y_stride},
+             to);
+        for (int32_t i = 0; i < count; ++i) own.out[static_cast<size_t>(i)].end(lowest - i);
     }
 
-    const convolve_table& table_;
-    int type_;
-    kernel_view kernel_;
-    coordinate<int32_t> anchor_;
-    int32_t height_;
+    convolve_operands o_;
+    void (*sum_)(const convolve_rows<E>&, uint8_t* const* to);
     int32_t channels_;
-    int64_t elements_;
+    bool contiguous_;
     std::vector<scratch> workers_;
 };
+
+template <class E>
+void run(const convolve_operands& o, const convolve_loops<E>& loops, Thread::ThreadPool* pool)
+{
+    convolution<E> job(o, loops, pool ? pool->GetThreadCount() : 1);
+    const int32_t blocks = (o.dst.height - 1) / rows_at_once + 1;
+    Thread::run_cancellable(pool, {0, blocks}, [&job](int32_t block, const Thread::ThreadInformation& where) {
+        job.compute(block, where.worker);
+    });
+}
+
+void run(const convolve_operands& o, Thread::ThreadPool* pool)
+{
+    const convolve_table& table = convolve_level();
+    const bool small = is_3x3(o.kernel);
+    switch (element_of(o.src.type)) {
+    case pixel_type::unsigned_8: return small ? run(o, table.small_u8, pool) : run(o, table.u8, pool);
+    case pixel_type::unsigned_16: return small ? run(o, table.small_u16, pool) : run(o, table.u16, pool);
+    case pixel_type::unsigned_32: return run(o, table.u32, pool);
+    case pixel_type::signed_8: return small ? run(o, table.small_i8, pool) : run(o, table.i8, pool);
+    case pixel_type::signed_16: return small ? run(o, table.small_i16, pool) : run(o, table.i16, pool);
+    case pixel_type::signed_32: return run(o, table.i32, pool);
+    case pixel_type::float_32: return small ? run(o, table.small_f32, pool) : run(o, table.f32, pool);
+    default: return run(o, table.f64, pool);
+    }
+}
 
 } // namespace
 
@@ -88,11 +123,7 @@ void convolve(const memory_2d& src, const kernel_view& kernel, coordinate<int32_
                     .sizes_differ = "ZELT Convolve input and output images must have the same size",
                     .in_place = "ZELT Convolve can not be used in place"});
     if (src.width <= 0 || src.height <= 0) return ThrowIfCancelled();
-    convolution job(src, kernel, anchor, dst, pool ? pool->GetThreadCount() : 1);
-    const int32_t blocks = (dst.height - 1) / rows_at_once + 1;
-    Thread::run_cancellable(pool, {0, blocks}, [&job](int32_t block, const Thread::ThreadInformation& where) {
-        job.compute(block, where.worker);
-    });
+    run({src, kernel, anchor, dst}, pool);
 }
 
 } // namespace Qor::Luxar::ZELT::Filters

@@ -5,132 +5,149 @@
 
 #include "filters/kernels/convolve_table.h"
 #include "filters/kernels/padded_row.inl"
+#include "filters/kernels/store_as.inl"
 
 namespace Qor::Luxar::ZELT::ZELT_LEVEL::filters {
 
 using Filters::convolve_rows;
 
-#if defined(__AVX512F__)
-inline constexpr int vector_bytes = 64;
-#elif defined(__AVX2__)
-inline constexpr int vector_bytes = 32;
-#else
-inline constexpr int vector_bytes = 16;
-#endif
-typedef double doubles __attribute__((vector_size(vector_bytes)));
-inline constexpr int lanes = vector_bytes / 8;
-
-inline doubles load_vector(const double* from)
-{
-    doubles v;
-    __builtin_memcpy(&v, from, sizeof v);
-    return v;
-}
-inline void store_vector(double* to, doubles v) { __builtin_memcpy(to, &v, sizeof v); }
-
-/// The sums of Rows output rows, lowest first, for as many columns as Vectors hold.
-template <int Rows, int Vectors>
-struct sums {
-    doubles of[Rows][Vectors];
-};
-
 /// Adds one source row's products to output rows First to Last. kernel: the row of the kernel that the source
 /// row meets in output row First; output row First + 1 meets the one before it.
-template <int First, int Last, int Rows, int Vectors>
-inline void add_row(sums<Rows, Vectors>& s, const double* kernel, int64_t width, const double* x,
-                    int64_t step)
+template <int First, int Last, int Rows, int Count, class E>
+ZELT_INLINE void add_row(tile<Rows, Count>& sum, const double* kernel, int64_t width, const E* x,
+                         int64_t step)
 {
     x += (width - 1) * step;
     for (int64_t i = 0; i < width; ++i, x -= step) {
-        doubles v[Vectors];
-        for (int n = 0; n < Vectors; ++n) v[n] = load_vector(x + n * lanes);
-        for (int r = First; r <= Last; ++r) {
-            const double k = kernel[i - (r - First) * width];
-            for (int n = 0; n < Vectors; ++n) s.of[r][n] += k * v[n];
-        }
+        vectors<Count> v;
+        load(v, x);
+        add_products<First, Last>(sum, kernel + i, width, v);
     }
 }
 
-template <int Rows, int Vectors>
-void sum_tile(const convolve_rows& job, int64_t x, double* const* to)
+/// As much of some output rows as a tile holds, from column x on, for a kernel of any size.
+template <int Rows, int Count, class E>
+[[gnu::noinline]] void sum_tile(const convolve_rows<E>& job, int64_t x, double* const* to)
 {
     const int64_t width = job.kernel_width, height = job.kernel_height, step = job.step;
-    const double* const* const rows = job.rows;
+    const E* const* const rows = job.rows;
     const double* const kernel = job.kernel;
-    sums<Rows, Vectors> s{};
+    tile<Rows, Count> sum{};
     for (int64_t y = 0; y < height + Rows - 1; ++y) {
-        const double* const row = rows[y] + x;
+        const E* const row = rows[y] + x;
         // Output row r meets this source row at kernel row y - r.
         const int64_t first = y < height ? 0 : y - height + 1;
+        const int64_t last = y < Rows ? y : Rows - 1;
         const double* const k = kernel + (y - first) * width;
         if constexpr (Rows == 1) {
-            add_row<0, 0>(s, k, width, row, step);
-        } else if constexpr (Rows == 2) {
-            if (y == 0)
-                add_row<0, 0>(s, k, width, row, step);
-            else if (y < height)
-                add_row<0, 1>(s, k, width, row, step);
-            else
-                add_row<1, 1>(s, k, width, row, step);
+            add_row<0, 0>(sum, k, width, row, step);
         } else {
-            const int64_t last = y < Rows ? y : Rows - 1;
-            switch (first * 4 + last) {
-            case 0: add_row<0, 0>(s, k, width, row, step); break;
-            case 1: add_row<0, 1>(s, k, width, row, step); break;
-            case 2: add_row<0, 2>(s, k, width, row, step); break;
-            case 3: add_row<0, 3>(s, k, width, row, step); break;
-            case 5: add_row<1, 1>(s, k, width, row, step); break;
-            case 6: add_row<1, 2>(s, k, width, row, step); break;
-            case 7: add_row<1, 3>(s, k, width, row, step); break;
-            case 10: add_row<2, 2>(s, k, width, row, step); break;
-            case 11: add_row<2, 3>(s, k, width, row, step); break;
-            default: add_row<3, 3>(s, k, width, row, step); break;
+            switch (first * Rows + last) {
+            case 0: add_row<0, 0>(sum, k, width, row, step); break;
+            case 1: add_row<0, 1>(sum, k, width, row, step); break;
+            case 2: add_row<0, 2>(sum, k, width, row, step); break;
+            case 3: add_row<0, 3>(sum, k, width, row, step); break;
+            case 5: add_row<1, 1>(sum, k, width, row, step); break;
+            case 6: add_row<1, 2>(sum, k, width, row, step); break;
+            case 7: add_row<1, 3>(sum, k, width, row, step); break;
+            case 10: add_row<2, 2>(sum, k, width, row, step); break;
+            case 11: add_row<2, 3>(sum, k, width, row, step); break;
+            default: add_row<3, 3>(sum, k, width, row, step); break;
             }
         }
     }
+    for_each_vector(sum, [&](int r, int i, doubles v) { store_vector(to[r] + x + i, v); });
+}
+
+/// Asks for the memory that is needed next: beside the output, which is as good as never in a cache, and in
+/// the source, whose rows are each read in one go.
+template <int Rows, class E>
+ZELT_INLINE void prefetch(const convolve_rows<E>& job, uint8_t* const* to, int64_t begin, int64_t end)
+{
+    constexpr int64_t line = 64;
     for (int r = 0; r < Rows; ++r)
-        for (int n = 0; n < Vectors; ++n) store_vector(to[r] + x + n * lanes, s.of[r][n]);
+        for (int64_t i = begin; i < end; i += line) {
+            __builtin_prefetch(to[r] + i, 1);
+            if (job.next_row) __builtin_prefetch(job.next_row + r * job.next_stride + i);
+        }
 }
 
-template <int Rows, int Vectors>
-void sum_rows(const convolve_rows& job, double* const* to)
+template <class T, int Rows, int Count, class E>
+void sum_rows(const convolve_rows<E>& job, uint8_t* const* to)
 {
+    constexpr int64_t chunk = 256, bytes = sizeof(T);
     const int64_t elements = job.elements;
-    for (int64_t x = 0; x < elements; x += Vectors * lanes) sum_tile<Rows, Vectors>(job, x, to);
-}
-inline void sum(const convolve_rows& job, double* const* to)
-{
-    if (job.output_rows == 1)
-        sum_rows<1, 4>(job, to);
-    else if (job.output_rows == 2)
-        sum_rows<2, 4>(job, to);
-    else
-        sum_rows<4, 2>(job, to);
-}
-
-/// Limited to the range of T and cut toward zero; a NaN becomes the lowest value. Floats take the value
-/// itself.
-template <class T>
-void store_row(const double* sums, int64_t count, uint8_t* to)
-{
-    const contiguous_row<T> row{to};
-    for (int64_t i = 0; i < count; ++i) {
-        if constexpr (static_cast<T>(0.5) == 0) {
-            constexpr bool is_signed = static_cast<T>(-1) < 0;
-            constexpr auto bits = static_cast<int>(8 * sizeof(T)) - (is_signed ? 1 : 0);
-            constexpr auto high = static_cast<double>((uint64_t{1} << bits) - 1);
-            constexpr double low = is_signed ? -high - 1 : 0;
-            double v = sums[i];
-            v = v >= low ? v : low;
-            v = v < high ? v : high;
-            if constexpr (sizeof(T) < 4)
-                row[i] = static_cast<T>(static_cast<int32_t>(v));
-            else
-                row[i] = static_cast<T>(v);
-        } else {
-            row[i] = static_cast<T>(sums[i]);
+    alignas(64) double sums[Rows][chunk];
+    double* into[Rows];
+    for (int64_t begin = 0; begin < elements; begin += chunk) {
+        const int64_t end = elements - begin < chunk ? elements : begin + chunk;
+        prefetch<Rows>(job, to, begin * bytes, end * bytes);
+        for (int r = 0; r < Rows; ++r) into[r] = sums[r] - begin;
+        for (int64_t x = begin; x < end; x += Count * lanes) sum_tile<Rows, Count>(job, x, into);
+        for (int r = 0; r < Rows; ++r) {
+            int64_t x = begin;
+            for (; x + lanes <= end; x += lanes) store_as<T>(load_vector(into[r] + x), to[r] + x * bytes);
+            if (x < end) store_some_as<T>(load_vector(into[r] + x), end - x, to[r] + x * bytes);
         }
     }
 }
+
+template <class T, class E>
+void sum(const convolve_rows<E>& job, uint8_t* const* to)
+{
+    if (job.output_rows == 1)
+        sum_rows<T, 1, 4>(job, to);
+    else
+        sum_rows<T, 4, vector_bytes == 64 ? 4 : 2>(job, to);
+}
+
+// A kernel of 3 x 3, the one in most use, without loops.
+
+template <int Y, int Rows, class E>
+ZELT_INLINE void add_rows_of_3x3(tile<Rows, 1>& sum, const double* kernel, const E* const* rows, int64_t x,
+                                 int64_t step)
+{
+    constexpr int size = 3;
+    if constexpr (Y < size + Rows - 1) {
+        constexpr int first = Y < size ? 0 : Y - size + 1, last = Y < Rows ? Y : Rows - 1;
+        add_row<first, last>(sum, kernel + (Y - first) * size, size, rows[Y] + x, step);
+        add_rows_of_3x3<Y + 1>(sum, kernel, rows, x, step);
+    }
+}
+
+template <class T, int Rows, class E>
+void sum_rows_3x3(const convolve_rows<E>& job, uint8_t* const* to)
+{
+    constexpr int64_t chunk = 64, bytes = sizeof(T);
+    const E* rows[Rows + 2];
+    for (int i = 0; i < Rows + 2; ++i) rows[i] = job.rows[i];
+    uint8_t* into[Rows];
+    for (int i = 0; i < Rows; ++i) into[i] = to[i];
+    const double* const kernel = job.kernel;
+    const int64_t step = job.step, elements = job.elements;
+    for (int64_t x = 0; x < elements; x += lanes) {
+        if (x % chunk == 0) prefetch<Rows>(job, into, (x + chunk) * bytes, (x + 2 * chunk) * bytes);
+        tile<Rows, 1> sum{};
+        add_rows_of_3x3<0>(sum, kernel, rows, x, step);
+        if (const int64_t rest = elements - x; rest >= lanes)
+            for_each_vector(sum, [&](int r, int, doubles v) { store_as<T>(v, into[r] + x * bytes); });
+        else
+            for_each_vector(sum,
+                            [&](int r, int, doubles v) { store_some_as<T>(v, rest, into[r] + x * bytes); });
+    }
+}
+
+template <class T, class E>
+void sum_3x3(const convolve_rows<E>& job, uint8_t* const* to)
+{
+    if (job.output_rows == 1)
+        sum_rows_3x3<T, 1>(job, to);
+    else
+        sum_rows_3x3<T, 4>(job, to);
+}
+
+template <class T, class E>
+inline constexpr Filters::convolve_loops<E> convolve_loops_of{load_padded_row<T, E>, sum<T, E>,
+                                                              sum_3x3<T, E>};
 
 } // namespace Qor::Luxar::ZELT::ZELT_LEVEL::filters

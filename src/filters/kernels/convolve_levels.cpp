@@ -8,13 +8,19 @@ namespace Qor::Luxar::ZELT::ZELT_LEVEL::filters {
 
 extern const Filters::convolve_table convolve;
 const Filters::convolve_table convolve{
-    .load = {load_padded_row<uint8_t, double>, load_padded_row<uint16_t, double>,
-             load_padded_row<uint32_t, double>, load_padded_row<int8_t, double>,
-             load_padded_row<int16_t, double>, load_padded_row<int32_t, double>,
-             load_padded_row<float, double>, load_padded_row<double, double>},
-    .sum = sum,
-    .store = {store_row<uint8_t>, store_row<uint16_t>, store_row<uint32_t>, store_row<int8_t>,
-              store_row<int16_t>, store_row<int32_t>, store_row<float>, store_row<double>},
+    .u8 = convolve_loops_of<uint8_t, double>,
+    .u16 = convolve_loops_of<uint16_t, double>,
+    .u32 = convolve_loops_of<uint32_t, double>,
+    .i8 = convolve_loops_of<int8_t, double>,
+    .i16 = convolve_loops_of<int16_t, double>,
+    .i32 = convolve_loops_of<int32_t, double>,
+    .f32 = convolve_loops_of<float, double>,
+    .f64 = convolve_loops_of<double, double>,
+    .small_u8 = convolve_loops_of<uint8_t, float>,
+    .small_u16 = convolve_loops_of<uint16_t, float>,
+    .small_i8 = convolve_loops_of<int8_t, float>,
+    .small_i16 = convolve_loops_of<int16_t, float>,
+    .small_f32 = convolve_loops_of<float, float>,
 };
 
 } // namespace Qor::Luxar::ZELT::ZELT_LEVEL::filters

@@ -7,29 +7,37 @@
 namespace Qor::Luxar::ZELT::Filters {
 
 /// Neighbouring output rows, computed together: each source row is then read once for all of them.
+template <class E>
 struct convolve_rows {
     /// The padded source rows that they need, the lowest first: output_rows + kernel_height - 1 of them.
-    const double* const* rows;
-    int32_t output_rows; ///< 1, 2 or 4
+    const E* const* rows;
+    int32_t output_rows; ///< 1 or 4
     const double* kernel;
     int64_t kernel_width;
     int64_t kernel_height;
-    int64_t step;     ///< numbers from pixel to pixel
-    int64_t elements; ///< numbers of an output row
+    int64_t step;            ///< numbers from pixel to pixel
+    int64_t elements;        ///< numbers of an output row
+    const uint8_t* next_row; ///< the source's, that will be asked for next; null when that is not known
+    int64_t next_stride;
 };
 
-/// How far the loops read and write beyond the numbers that they are asked for.
+/// How far the loops read beyond the numbers that they are asked for.
 inline constexpr int64_t convolve_slack = 64;
 
-struct convolve_table {
-    using load_function = void (*)(const padded_source&, int64_t y, double* to);
-    using sum_function = void (*)(const convolve_rows&, double* const* to);
-    using store_function = void (*)(const double* sums, int64_t count, uint8_t* to);
+/// The loops for one type of pixels, read as numbers of E.
+template <class E>
+struct convolve_loops {
+    void (*load)(const padded_source&, int64_t y, E* to);
+    /// Fills the output rows, the lowest first.
+    void (*sum)(const convolve_rows<E>&, uint8_t* const* to);
+    void (*sum_3x3)(const convolve_rows<E>&, uint8_t* const* to);
+};
 
-    // By type: unsigned 8, 16, 32 bit, signed 8, 16, 32 bit, float, double.
-    load_function load[8];
-    sum_function sum;
-    store_function store[8];
+struct convolve_table {
+    convolve_loops<double> u8, u16, u32, i8, i16, i32, f32, f64;
+    /// For 3 x 3: floats hold these types as well, and reading half as much memory counts more than
+    /// conversions.
+    convolve_loops<float> small_u8, small_u16, small_i8, small_i16, small_f32;
 };
 
 } // namespace Qor::Luxar::ZELT::Filters

@@ -34,16 +34,19 @@ inline int64_t elements_of(const padded_source& src)
     return (src.padding.left + src.padding.count + src.padding.right) * src.channels;
 }
 
-/// Rows of E. At most `capacity` neighbouring rows are asked for at a time.
+/// Rows of E. At most `capacity` neighbouring rows are asked for at a time. The source's own pixels start at
+/// the beginning of a cache line, so that not every vector crosses one.
 template <class E>
 class row_ring {
 public:
     using loader = void (*)(const padded_source&, int64_t y, E* to);
 
-    /// slack: how many zeros follow the numbers of a row, for loops that read a little further.
+    /// slack: how many numbers may be read beyond a row.
     row_ring(const padded_source& src, loader load, int64_t capacity, int64_t slack)
-        : src_(src), load_(load), length_(elements_of(src) + slack),
-          loaded_(static_cast<size_t>(capacity), -1), elements_(static_cast<size_t>(capacity * length_))
+        : src_(src), load_(load),
+          before_(round_up(src.padding.left * src.channels) - src.padding.left * src.channels),
+          length_(round_up(before_ + elements_of(src) + slack)), loaded_(static_cast<size_t>(capacity), -1),
+          elements_(static_cast<size_t>(capacity * length_ + line))
     {
     }
 
@@ -52,14 +55,21 @@ public:
     {
         y = std::clamp<int64_t>(y, 0, src_.height - 1);
         const int64_t slot = y % static_cast<int64_t>(loaded_.size());
-        E* const row = elements_.data() + slot * length_;
+        const auto address = reinterpret_cast<uintptr_t>(elements_.data());
+        const auto to_line =
+            static_cast<int64_t>((line * sizeof(E) - address % (line * sizeof(E))) / sizeof(E));
+        E* const row = elements_.data() + to_line + slot * length_ + before_;
         if (std::exchange(loaded_[static_cast<size_t>(slot)], y) != y) load_(src_, y, row);
         return row;
     }
 
 private:
+    static constexpr int64_t line = 64 / sizeof(E);
+    static int64_t round_up(int64_t n) { return (n + line - 1) / line * line; }
+
     padded_source src_;
     loader load_;
+    int64_t before_; ///< numbers of a slot before its row
     int64_t length_;
     std::vector<int64_t> loaded_; ///< which row lies in a slot
     std::vector<E> elements_;

@@ -1,0 +1,108 @@
+// Vectors of doubles side by side, and rows of them one above the other, that stay in registers.
+#pragma once
+
+#include "pixel/level.h"
+
+#include <cstdint>
+
+namespace Qor::Luxar::ZELT::ZELT_LEVEL::filters {
+
+#if defined(__AVX512F__)
+inline constexpr int vector_bytes = 64;
+#elif defined(__AVX2__)
+inline constexpr int vector_bytes = 32;
+#else
+inline constexpr int vector_bytes = 16;
+#endif
+inline constexpr int lanes = vector_bytes / 8;
+typedef double doubles __attribute__((vector_size(vector_bytes)));
+
+#define ZELT_INLINE [[gnu::always_inline]] inline
+
+ZELT_INLINE doubles load_vector(const double* from)
+{
+    doubles v;
+    __builtin_memcpy(&v, from, sizeof v);
+    return v;
+}
+ZELT_INLINE doubles load_vector(const float* from)
+{
+    typedef float half __attribute__((vector_size(vector_bytes / 2)));
+    half v;
+    __builtin_memcpy(&v, from, sizeof v);
+    return __builtin_convertvector(v, doubles);
+}
+ZELT_INLINE void store_vector(double* to, doubles v) { __builtin_memcpy(to, &v, sizeof v); }
+
+/// Count vectors. They nest instead of being an array: compilers keep what has a name in registers, and put
+/// into memory what is counted.
+template <int Count>
+struct vectors {
+    doubles v;
+    vectors<Count - 1> more;
+};
+template <>
+struct vectors<0> {
+};
+
+/// As many in each of some rows.
+template <int Rows, int Count>
+struct tile {
+    vectors<Count> row;
+    tile<Rows - 1, Count> below;
+};
+template <int Count>
+struct tile<0, Count> {
+};
+
+template <int Count, class E>
+ZELT_INLINE void load(vectors<Count>& to, const E* from)
+{
+    if constexpr (Count > 0) {
+        to.v = load_vector(from);
+        load(to.more, from + lanes);
+    }
+}
+
+/// Calls f(row, offset, vector) for every vector; the offset is in numbers.
+template <int Row = 0, int Rows, int Count, class F>
+ZELT_INLINE void for_each_vector(const tile<Rows, Count>& t, F&& f)
+{
+    if constexpr (Rows > 0) {
+        for_each_vector<Row, 0>(t.row, f);
+        for_each_vector<Row + 1>(t.below, f);
+    }
+}
+template <int Row, int Offset, int Count, class F>
+ZELT_INLINE void for_each_vector(const vectors<Count>& v, F&& f)
+{
+    if constexpr (Count > 0) {
+        f(Row, Offset, v.v);
+        for_each_vector<Row, Offset + lanes>(v.more, f);
+    }
+}
+
+template <int Count>
+ZELT_INLINE void add_products(vectors<Count>& sum, double k, const vectors<Count>& x)
+{
+    if constexpr (Count > 0) {
+        sum.v += k * x.v;
+        add_products(sum.more, k, x.more);
+    }
+}
+
+/// The same for rows First to Last. *k is the factor of row First, and each row's factor lies `distance`
+/// before that of the row above.
+template <int First, int Last, int Rows, int Count>
+ZELT_INLINE void add_products(tile<Rows, Count>& sum, const double* k, int64_t distance,
+                              const vectors<Count>& x)
+{
+    if constexpr (First > 0) {
+        add_products<First - 1, Last - 1>(sum.below, k, distance, x);
+    } else if constexpr (Last >= 0) {
+        add_products(sum.row, *k, x);
+        add_products<0, Last - 1>(sum.below, k - distance, distance, x);
+    }
+}
+
+} // namespace Qor::Luxar::ZELT::ZELT_LEVEL::filters
