@@ -72,6 +72,7 @@ double iterate(const pixel_bins& bins)
 double find_threshold(const memory_2d& src)
 {
     double limit = 0;
+    if (src.width <= 0 || src.height <= 0) return limit; // no bin has a pixel
     switch_scalar(src.type, [&]<class T>(pixel<T>) {
         if (is_cheap_by_value(src)) {
             const binning b = bins_by_value(src.type);
