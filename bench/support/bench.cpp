@@ -1,6 +1,6 @@
 #include "bench.h"
 
-#include <opencv2/core.hpp>
+#include <opencv2/core/utility.hpp>
 
 #include <cstdint>
 #include <cstring>
@@ -21,6 +21,9 @@ void register_copy(const std::string& case_name, std::size_t bytes)
         state.SetBytesProcessed(static_cast<std::int64_t>(bytes) * state.iterations());
     });
 }
+
+opencv_threads::opencv_threads(int count) { cv::setNumThreads(count); }
+opencv_threads::~opencv_threads() { cv::setNumThreads(1); }
 
 } // namespace zelt_bench
 

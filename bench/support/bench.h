@@ -13,6 +13,14 @@ namespace zelt_bench {
 /// Registers the plain copy that belongs to a case: reads and writes the given number of bytes.
 void register_copy(const std::string& case_name, std::size_t bytes);
 
+/// OpenCV has one thread, but more during the life of this.
+struct opencv_threads {
+    explicit opencv_threads(int count);
+    ~opencv_threads();
+    opencv_threads(const opencv_threads&) = delete;
+    opencv_threads& operator=(const opencv_threads&) = delete;
+};
+
 /// Registers a case. It runs `check` once before it is timed: a wrong result is reported and never timed.
 template <class Check, class Work>
 void register_case(const std::string& name, Check check, Work work)
@@ -35,6 +43,24 @@ void register_peer(const std::string& case_name, const std::string& peer, Work w
 {
     register_case(
         case_name + "/peer:" + peer, [] { return true; }, work);
+}
+
+/// Registers work for several threads, which is measured by the clock: a case, or with a name like
+/// "Convolve-7x7/u8/2000-on-2/peer:filter2D" what belongs to it. OpenCV may use as many threads meanwhile.
+template <class Check, class Work>
+void register_threaded(const std::string& name, int threads, Check check, Work work)
+{
+    benchmark::RegisterBenchmark(name.c_str(), [=](benchmark::State& state) {
+        const opencv_threads allowed(threads);
+        if (!check()) {
+            state.SkipWithError("wrong result");
+            return;
+        }
+        for (auto _ : state) {
+            work();
+            benchmark::ClobberMemory();
+        }
+    })->UseRealTime();
 }
 
 } // namespace zelt_bench
