@@ -1,8 +1,9 @@
 #!/usr/bin/python3
-"""Times one call from Python on a small image beside the same call of the libraries that users know: python_bench.py
+"""Times calls from Python beside the same calls of the libraries that users know: python_bench.py [PART ...]
 
 Each case is checked first, then timed in CPU time of this thread, best of many rounds, in turn with its peers.
-The last part shows how threads share the processors.
+Parts: compare (one call on a small image), functions (of single pixels, beside NumPy), threads (how they share the
+processors). All of them, unless some are named.
 """
 
 import os
@@ -114,5 +115,40 @@ def threads():
         print(f"    {count} threads {min(run(count) for _ in range(3)):8.3f}")
 
 
-compare()
-threads()
+def functions():
+    root = zelt.create("ZELT.Main2")
+    basic, maths = root.Basic, root.Math
+    random = np.random.default_rng(1)
+    print("\nFunctions into a given output, nanoseconds of CPU time for a pixel, zelt to numpy:")
+    for side in (256, 4096):
+        unit, other = (random.random((side, side), np.float32) for _ in range(2))
+        for kind in (np.float32, np.float64):
+            near, wide, large = ((unit * 2 - 1) * 10).astype(kind), ((unit * 2 - 1) * 100).astype(kind), (unit * 999 + 0.001).astype(kind)
+            sine, second, out = (unit * 2 - 1).astype(kind), ((other * 2 - 1) * 10).astype(kind), np.zeros_like(unit, kind)
+            calls = [("exp", basic.Exp, np.exp, (near,)), ("log", basic.Log, np.log, (large,)),
+                     ("power 0.45", basic.Power, lambda a, b, to: np.power(a, kind(b), to), (large, 0.45)),
+                     ("square", basic.Power, lambda a, b, to: np.square(a, to), (large, 2)),
+                     ("root", basic.Power, lambda a, b, to: np.sqrt(a, to), (large, 0.5))]
+            if kind == np.float32:
+                calls += [("sin", maths.Sin, np.sin, (wide,)), ("cos", maths.Cos, np.cos, (wide,)), ("tan", maths.Tan, np.tan, (wide,)),
+                          ("asin", maths.Asin, np.arcsin, (sine,)), ("acos", maths.Acos, np.arccos, (sine,)),
+                          ("atan", maths.Atan, np.arctan, (near,)), ("atan2", maths.Atan2, np.arctan2, (near, second))]
+            for name, ours, numpys, arguments in calls:
+                ours(*arguments, out)
+                mine = out.copy()
+                numpys(*arguments, out)
+                if not np.allclose(mine, out, rtol=1e-5, atol=1e-6):
+                    sys.exit(f"{name}: wrong result")
+                count = max(1, 2**22 // side**2)
+                best = [float("inf")] * 2
+                for _ in range(5):
+                    for i, call in enumerate((ours, numpys)):
+                        before = time.thread_time()
+                        for _ in range(count):
+                            call(*arguments, out)
+                        best[i] = min(best[i], (time.thread_time() - before) / count / side**2 * 1e9)
+                print(f"    {name:12}{kind.__name__:8}{side:6}{best[0]:8.3f}{best[1]:8.3f}{best[0] / best[1]:8.2f}")
+
+
+for part in sys.argv[1:] or ["compare", "functions", "threads"]:
+    {"compare": compare, "functions": functions, "threads": threads}[part]()
