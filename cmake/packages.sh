@@ -9,6 +9,9 @@ pybind11-dev python3-dev python3 python3-numpy python3-scipy python3-skimage pyt
 # Formatting and fuzzing, for those who change the project.
 dev_packages="clang clang-format libclang-rt-14-dev"
 
+# The site of the documentation.
+docs_packages="mkdocs mkdocs-material"
+
 # Installs those of the named packages that are missing; says nothing and touches nothing if none is.
 need_packages() {
     missing=
