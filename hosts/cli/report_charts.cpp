@@ -12,7 +12,7 @@ namespace cli {
 namespace {
 
 constexpr double width = 640, height = 260;
-constexpr double left = 58, right = 12, top = 12, bottom = 42;
+constexpr double left = 58, right = 22, top = 12, bottom = 42;
 
 std::string coordinate(double value)
 {
