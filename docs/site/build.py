@@ -7,6 +7,7 @@ Pages come from docs/, the reference from the interface tables, the gallery's pi
 import ast
 import json
 import pathlib
+import re
 import shutil
 import subprocess
 import sys
@@ -57,6 +58,16 @@ def gallery(build, folder):
     shutil.rmtree(work)
 
 
+def shell_page(build):
+    """What each command says of itself."""
+    overview = pages.run(["zelt", "--help"], build, SOURCE)
+    commands = re.findall(r"^  ([a-z]+) {2,}", overview.split("Subcommands:")[1].split("Examples:")[0], re.MULTILINE)
+    lines = ["# Command line", "", "```text", overview.rstrip(), "```", ""]
+    for command in commands:
+        lines += [f"## zelt {command}", "", "```text", pages.run(["zelt", command, "--help"], build, SOURCE).rstrip(), "```", ""]
+    return lines
+
+
 def navigation(written, reference):
     known = [name for name in FIRST if name in written]
     others = [name for name in written if name not in [*FIRST, "index.md", "architecture.md"]]
@@ -66,8 +77,7 @@ def navigation(written, reference):
         return {TITLES.get(name, pathlib.Path(name).stem.capitalize()): name}
 
     return [{"Home": "index.md"}, *map(titled, known), {"Gallery": "gallery/index.md"},
-            {"Reference": [{title: f"reference/{name}"} for title, name in reference]},
-            {"Project": list(map(titled, project))}]
+            {"Reference": reference}, {"Project": list(map(titled, project))}]
 
 
 def main():
@@ -81,6 +91,8 @@ def main():
     written = copied(folder)
     shutil.copy(SOURCE / "docs/site/style.css", folder)
     reference = write_reference(folder / "reference", SOURCE / "include/zelt/interfaces")
+    (folder / "reference/shell.md").write_text("\n".join(shell_page(build)))
+    reference.append({"Command line": "reference/shell.md"})
     gallery(build, folder / "gallery")
 
     settings = folder.with_suffix(".yml")

@@ -5,6 +5,7 @@ rules and failures. Whether a method is there yet, the library itself is asked.
 """
 
 import enum
+import inspect
 import re
 
 import zelt
@@ -111,25 +112,25 @@ def method_section(facet_name, name, row, comment, writable):
     return lines + table_of(parts) + (arguments_table(row) if row["kind"] != _describe.PROPERTY_GET else [])
 
 
-def facet_page(root, facet_name, comments):
-    """The lines of a page, and how many methods are there and are missing."""
-    facet = getattr(root, facet_name)
-    interface = type(facet).__name__
-    about, methods = comments.get(interface, ([], {}))
+def page_of(title, access, kind, comments, there):
+    """The lines of a page about an interface, and how many methods are there and are missing. A name must be described in the
+    headers: KeyError otherwise."""
+    about, methods = comments[kind.__name__]
     rows, missing = [], []
-    for name, attribute in vars(type(facet)).items():
+    for name, attribute in vars(kind).items():
         if name.startswith("_"):
             continue
         is_property = isinstance(attribute, property)
         row = attribute.fget._row if is_property else attribute._row
-        if is_property or is_there(facet, name, row):
+        if is_property and _describe.result_of(row).startswith("I") and _describe.result_of(row) != "Image":
+            continue  # a facet of a root
+        if is_property or there(name, row):
             rows.append((name, row, is_property and attribute.fset is not None))
         else:
             missing.append((name, row))
 
     parts = paragraphs(about)
-    lines = [f"# {facet_name}", "", f"`root.{facet_name}` in Python, `IZELT2::get_{facet_name}` in C++ (`{interface}`), "
-              f"`zelt call {facet_name}.METHOD` in the shell.", ""]
+    lines = [f"# {title}", "", access, ""]
     if parts and not parts[0][0]:
         lines += [escaped(parts.pop(0)[1]), ""]
     lines += table_of(parts)
@@ -137,12 +138,19 @@ def facet_page(root, facet_name, comments):
         lines += [f"{len(rows)} of {len(rows) + len(missing)} methods are there; "
                   "[the others](#not-implemented-yet) answer \"not implemented\" (E_NOTIMPL).", ""]
     for name, row, writable in rows:
-        lines += method_section(facet_name, name, row, methods.get(name, []), writable)
+        lines += method_section(title.split(" ")[0], name, row, methods[name], writable)
     if missing:
         lines += ["## Not implemented yet", "", "These names are taken; a call answers E_NOTIMPL.", "",
                   "| Method | What it will be |", "|---|---|"]
         lines += [f"| {escaped(name)} | {escaped(row['help'])} |" for name, row in missing]
     return lines, len(rows), len(missing)
+
+
+def facets_of(root):
+    """[(name, facet, what it is for)]"""
+    properties = [(name, a) for name, a in vars(type(root)).items() if isinstance(a, property)]
+    return [(name, getattr(root, name), a.fget._row["help"]) for name, a in properties
+            if isinstance(getattr(root, name), zelt.Object)]
 
 
 def enumerations_page():
@@ -155,25 +163,63 @@ def enumerations_page():
     return lines
 
 
+def python_page():
+    """What the package has beside the interfaces."""
+    lines = ["# Python module", "", *inspect.getdoc(zelt).splitlines()[:1], ""]
+    for name in zelt.__all__:
+        thing = getattr(zelt, name)
+        lines += [f"## {name}", ""]
+        try:
+            shown = f"zelt.{name}{inspect.signature(thing)}"
+        except ValueError:
+            shown = f"zelt.{name}"
+        lines += ["```text", shown, *["", inspect.getdoc(thing)] * bool(inspect.getdoc(thing)), "```", ""]
+        if isinstance(thing, type):
+            members = [(n, inspect.getdoc(m)) for n, m in vars(thing).items() if not n.startswith("_") and inspect.getdoc(m)]
+            if members and not hasattr(thing, "_fields"):
+                lines += ["| | |", "|---|---|", *[f"| `{n}` | {escaped(' '.join(d.split()))} |" for n, d in members], ""]
+    return lines
+
+
 def write_reference(folder, headers):
-    """Writes the pages into a folder; returns [(title, file name)] in the order of the navigation."""
+    """Writes the pages into a folder; returns their navigation: {title: page or a list of the same}."""
     folder.mkdir(parents=True)
     comments = header_comments(headers)
     zelt._make_classes()
-    root = zelt.create("ZELT.Main2")
-    pages, overview = [], ["# Reference", "", "Facets of the root object `ZELT.Main2`, made from the library's own tables.", "",
-                           "| Facet | For | Methods | Not implemented yet |", "|---|---|---|---|"]
-    for name, attribute in vars(type(root)).items():
-        if not isinstance(attribute, property) or not isinstance(getattr(root, name), zelt.Object):
-            continue
-        text, present, missing = facet_page(root, name, comments)
-        title = name
-        if present or missing:
-            (folder / f"{name}.md").write_text("\n".join(text) + "\n")
-            pages.append((name, f"{name}.md"))
-            title = f"[{name}]({name}.md)"
-        overview.append(f"| {title} | {escaped(attribute.fget._row['help'])} | {present} | {missing or ''} |")
-    overview += ["", "A facet with 0 methods has none yet."]
-    (folder / "index.md").write_text("\n".join(overview) + "\n")
-    (folder / "enumerations.md").write_text("\n".join(enumerations_page()) + "\n")
-    return [("Overview", "index.md"), *pages, ("Enumerations", "enumerations.md")]
+    navigation, known = [{"Overview": f"{folder.name}/index.md"}], set()
+    overview = ["# Reference", "", "Made from the library's own tables and headers.", ""]
+
+    def page(title, file, lines):
+        (folder / file).write_text("\n".join(lines) + "\n")
+        return {title: f"{folder.name}/{file}"}
+
+    for program, heading in (("ZELT.Main2", "Facets"), ("ZELT.Main", "First generation")):
+        first = program == "ZELT.Main"
+        root = zelt.create(program)
+        interface = type(root).__name__
+        overview += [f"## {heading}", "", f"The object `{program}`, [{interface}]({interface}.md), and its facets:", "",
+                     "| Facet | For | Methods | Not implemented yet |", "|---|---|---|---|"]
+        access = f'`zelt.create("{program}")` in Python, `zelt::create<zelt::{interface}>("{program}")` in C++.'
+        lines, _, _ = page_of(interface, access, type(root), comments, lambda *_: True)
+        pages = [page("Root", f"{interface}.md", lines)]
+        for name, facet, purpose in facets_of(root):
+            kind = type(facet).__name__
+            if kind in known:
+                continue
+            known.add(kind)
+            access = f"`root.{name}` in Python, `{interface}::get_{name}` in C++ (`{kind}`)"
+            access += f", `zelt call {name}.METHOD` in the shell." if not first else "."
+            lines, present, missing = page_of(f"{name} (first generation)" if first else name, access, type(facet), comments,
+                                              lambda method, row, facet=facet: is_there(facet, method, row))
+            title = name
+            if present or missing:
+                file = f"{kind if first else name}.md"
+                pages.append(page(name, file, lines))
+                title = f"[{name}]({file})"
+            overview.append(f"| {title} | {escaped(purpose)} | {present} | {missing or ''} |")
+        overview += ["", "The other facets are those of the second generation." if first else
+                     "A facet with 0 methods has none yet.", ""]
+        navigation += [{heading: pages}] if first else pages
+    page("Overview", "index.md", overview)
+    return [*navigation, page("Enumerations", "enumerations.md", enumerations_page()),
+            page("Python module", "python.md", python_page())]

@@ -5,11 +5,15 @@ import pathlib
 import sys
 
 from conftest import BUILD
+import numpy as np
 import pytest
 
 SOURCE = pathlib.Path(__file__).parents[2]
 sys.path.insert(0, str(SOURCE / "docs/site"))
+import links
 import pages
+import reference
+import zelt
 
 PAGES = [SOURCE / "README.md", SOURCE / "docs/start.md"]
 
@@ -52,12 +56,41 @@ def test_gallery_makes_pictures(script, camera):
     pages.run([sys.executable, "-W", "error", "-B", str(script)], BUILD, camera)
     made = list(camera.glob("*.png"))
     assert made
-    import zelt
-
     root = zelt.create("ZELT.Main2")
     for picture in made:
         image = zelt.imread(picture)
         assert root.Statistics.Maximum(image) > root.Statistics.Minimum(image), f"{picture.name} shows nothing"
+
+
+def test_reference_tells_all_methods_and_which_are_missing(tmp_path):
+    folder = tmp_path / "reference"
+    reference.write_reference(folder, SOURCE / "include/zelt/interfaces")
+    page = (folder / "Filters.md").read_text()
+    filters = zelt.create("ZELT.Main2").Filters
+    described, _, missing = page.partition("## Not implemented yet")
+    for name in (n for n in vars(type(filters)) if not n.startswith("_")):
+        assert (f"\n## {name}\n" in described) != (f"| {name} |" in missing), name
+
+    gauss = described.split("\n## Gauss\n")[1].split("\n## ")[0]
+    assert "| **Border** | from 0.5 on the image continues" in gauss          # from the header
+    assert "Filters.Gauss(pIImage, sigma, [pIOut]) -> Image" in gauss          # from the table
+
+    frame = np.zeros((8, 8), np.uint8)
+    for name, arguments in {"Sobel": (), "Gauss": (1.0,), "Median": (3, 3), "Kuwahara": (3, 3), "LowPass": (0.1, 0.1)}.items():
+        try:
+            getattr(filters, name)(frame, *arguments)
+            answers = True
+        except zelt.Error as error:
+            answers = error.hresult != reference.E_NOTIMPL
+        assert answers == (f"\n## {name}\n" in described), name
+
+
+def test_links_that_lead_nowhere_are_found(tmp_path):
+    (tmp_path / "a.html").write_text('<a href="b.html#x">1</a><a href="c.html">2</a><img src="https://elsewhere/p.png">')
+    (tmp_path / "b.html").write_text('<h1 id="y"><a href="a.html">3</a><a href="#y">4</a><a href="https://elsewhere">5</a></h1>')
+    assert sorted(links.faults(tmp_path)) == [
+        "a.html: b.html#x: no such place", "a.html: c.html is not there",
+        "a.html: https://elsewhere/p.png is loaded from a network"]
 
 
 def test_a_block_that_fails_is_noticed(camera):
