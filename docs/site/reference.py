@@ -18,7 +18,11 @@ LABEL = re.compile(r"([A-Z][A-Za-z]*(?: [a-z]+)?)\s{2,}(.*)")
 
 
 def escaped(text):
-    return re.sub(r"([\\*_`<|\[\]])", r"\\\1", text)
+    """Text as Markdown that shows it as it is; names between backticks are code."""
+    parts = text.split("`") if text.count("`") % 2 == 0 else [text]
+    plain = [re.sub(r"([\\*_`<|\[\]])", r"\\\1", part) for part in parts[::2]]
+    code = [f"`{part}`" for part in parts[1::2]]
+    return "".join(a + b for a, b in zip(plain, [*code, ""]))
 
 
 def paragraphs(comment):
@@ -173,7 +177,10 @@ def python_page():
             shown = f"zelt.{name}{inspect.signature(thing)}"
         except ValueError:
             shown = f"zelt.{name}"
-        lines += ["```text", shown, *["", inspect.getdoc(thing)] * bool(inspect.getdoc(thing)), "```", ""]
+        lines += ["```text", shown, "```", ""]
+        for paragraph in (inspect.getdoc(thing) or "").split("\n\n"):
+            in_columns = re.search(r"\S {2,}\S|\n ", paragraph)
+            lines += ["```text", paragraph, "```", ""] if in_columns else [escaped(paragraph), ""]
         if isinstance(thing, type):
             members = [(n, inspect.getdoc(m)) for n, m in vars(thing).items() if not n.startswith("_") and inspect.getdoc(m)]
             if members and not hasattr(thing, "_fields"):
