@@ -62,9 +62,9 @@ def shell_page(build):
     """What each command says of itself."""
     overview = pages.run(["zelt", "--help"], build, SOURCE)
     commands = re.findall(r"^  ([a-z]+) {2,}", overview.split("Subcommands:")[1].split("Examples:")[0], re.MULTILINE)
-    lines = ["# Command line", "", "```text", overview.rstrip(), "```", ""]
+    lines = ["# Command line", "", "```output", overview.rstrip(), "```", ""]
     for command in commands:
-        lines += [f"## zelt {command}", "", "```text", pages.run(["zelt", command, "--help"], build, SOURCE).rstrip(), "```", ""]
+        lines += [f"## zelt {command}", "", "```output", pages.run(["zelt", command, "--help"], build, SOURCE).rstrip(), "```", ""]
     return lines
 
 

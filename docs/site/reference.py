@@ -110,7 +110,7 @@ def method_section(facet_name, name, row, comment, writable):
     if row["kind"] == _describe.PROPERTY_GET:
         lines += [f"A property, {_describe.result_of(row)}" + ("; can be set." if writable else "; can only be read."), ""]
     else:
-        lines += ["```text", call_text(facet_name, name, row), "```", ""]
+        lines += ["```output", call_text(facet_name, name, row), "```", ""]
     if row["pixels"] and not any(label == "Pixels" for label, _ in parts):
         parts.insert(0, ("Pixels", row["pixels"]))
     return lines + table_of(parts) + (arguments_table(row) if row["kind"] != _describe.PROPERTY_GET else [])
@@ -177,10 +177,10 @@ def python_page():
             shown = f"zelt.{name}{inspect.signature(thing)}"
         except ValueError:
             shown = f"zelt.{name}"
-        lines += ["```text", shown, "```", ""]
+        lines += ["```output", shown, "```", ""]
         for paragraph in (inspect.getdoc(thing) or "").split("\n\n"):
             in_columns = re.search(r"\S {2,}\S|\n ", paragraph)
-            lines += ["```text", paragraph, "```", ""] if in_columns else [escaped(paragraph), ""]
+            lines += ["```output", paragraph, "```", ""] if in_columns else [escaped(paragraph), ""]
         if isinstance(thing, type):
             members = [(n, inspect.getdoc(m)) for n, m in vars(thing).items() if not n.startswith("_") and inspect.getdoc(m)]
             if members and not hasattr(thing, "_fields"):
