@@ -185,11 +185,11 @@ TEST(Scalars, OfPlainAndOfSpecialFloatsAreThoseOfTheDefinition)
     });
 }
 
-/// Rows longer than what is summed at once, with values that occur often.
-TEST(Scalars, OfWideImagesCountTiesAcrossTheWholeRow)
+/// Rows longer than what is summed at once and blocks of several short rows, with values that occur often.
+TEST(Scalars, CountTiesAcrossLongRowsAndBlocksOfRows)
 {
     for_each_real_type([]<class T>(pixel<T>) {
-        for (const size s : {size{9001, 3}, size{2100, 5}, size{70, 40}})
+        for (const size s : {size{9001, 3}, size{2100, 5}, size{256, 41}, size{70, 130}})
             for (const auto l : {memory_layout::packed, memory_layout::mirrored})
                 for (const int few : {1, 2, 57})
                     check_image<T>(s, l, [&](int x, int y) {
@@ -210,6 +210,8 @@ TEST(Scalars, OfLargeIntegersAreThoseOfAddingDoublesOneByOne)
             return static_cast<T>(int64_t{limits::min()} / 3 + (x + y) % 100);
         };
         check_image<T>({3001, 9}, memory_layout::packed, high);
+        check_image<T>({64, 300}, memory_layout::packed, high);
+        check_image<T>({33, 300}, memory_layout::packed, low);
         check_image<T>({3001, 9}, memory_layout::packed,
                        [&](int x, int y) { return (x / 1000 + y) % 2 != 0 ? low(x, y) : high(x, y); });
     });

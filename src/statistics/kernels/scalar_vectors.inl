@@ -31,6 +31,7 @@ inline bits set_i16(int16_t a) { return _mm512_set1_epi16(a); }
 inline bits set_i64(int64_t a) { return _mm512_set1_epi64(a); }
 inline bits and_bits(bits a, bits b) { return _mm512_and_si512(a, b); }
 inline bits xor_bits(bits a, bits b) { return _mm512_xor_si512(a, b); }
+inline bits add_i16(bits a, bits b) { return _mm512_add_epi16(a, b); }
 inline bits add_i32(bits a, bits b) { return _mm512_add_epi32(a, b); }
 inline bits add_i64(bits a, bits b) { return _mm512_add_epi64(a, b); }
 inline bits min_u8(bits a, bits b) { return _mm512_min_epu8(a, b); }
@@ -39,6 +40,7 @@ inline bits min_i16(bits a, bits b) { return _mm512_min_epi16(a, b); }
 inline bits max_i16(bits a, bits b) { return _mm512_max_epi16(a, b); }
 inline bits high_bytes(bits a) { return _mm512_srli_epi16(a, 8); }
 inline bits high_halves(bits a) { return _mm512_maskz_srli_epi64(0xff, a, 32); }
+inline bits high_shorts(bits a) { return _mm512_maskz_srai_epi32(0xffff, a, 16); } // with their sign
 inline bits madd(bits a, bits b) { return _mm512_madd_epi16(a, b); }
 inline bits sad(bits a, bits b) { return _mm512_sad_epu8(a, b); }
 #elif defined(__AVX2__)
@@ -50,6 +52,7 @@ inline bits set_i16(int16_t a) { return _mm256_set1_epi16(a); }
 inline bits set_i64(int64_t a) { return _mm256_set1_epi64x(a); }
 inline bits and_bits(bits a, bits b) { return _mm256_and_si256(a, b); }
 inline bits xor_bits(bits a, bits b) { return _mm256_xor_si256(a, b); }
+inline bits add_i16(bits a, bits b) { return _mm256_add_epi16(a, b); }
 inline bits add_i32(bits a, bits b) { return _mm256_add_epi32(a, b); }
 inline bits add_i64(bits a, bits b) { return _mm256_add_epi64(a, b); }
 inline bits min_u8(bits a, bits b) { return _mm256_min_epu8(a, b); }
@@ -58,6 +61,7 @@ inline bits min_i16(bits a, bits b) { return _mm256_min_epi16(a, b); }
 inline bits max_i16(bits a, bits b) { return _mm256_max_epi16(a, b); }
 inline bits high_bytes(bits a) { return _mm256_srli_epi16(a, 8); }
 inline bits high_halves(bits a) { return _mm256_srli_epi64(a, 32); }
+inline bits high_shorts(bits a) { return _mm256_srai_epi32(a, 16); } // with their sign
 inline bits madd(bits a, bits b) { return _mm256_madd_epi16(a, b); }
 inline bits sad(bits a, bits b) { return _mm256_sad_epu8(a, b); }
 #else
@@ -69,6 +73,7 @@ inline bits set_i16(int16_t a) { return _mm_set1_epi16(a); }
 inline bits set_i64(int64_t a) { return _mm_set1_epi64x(a); }
 inline bits and_bits(bits a, bits b) { return _mm_and_si128(a, b); }
 inline bits xor_bits(bits a, bits b) { return _mm_xor_si128(a, b); }
+inline bits add_i16(bits a, bits b) { return _mm_add_epi16(a, b); }
 inline bits add_i32(bits a, bits b) { return _mm_add_epi32(a, b); }
 inline bits add_i64(bits a, bits b) { return _mm_add_epi64(a, b); }
 inline bits min_u8(bits a, bits b) { return _mm_min_epu8(a, b); }
@@ -77,6 +82,7 @@ inline bits min_i16(bits a, bits b) { return _mm_min_epi16(a, b); }
 inline bits max_i16(bits a, bits b) { return _mm_max_epi16(a, b); }
 inline bits high_bytes(bits a) { return _mm_srli_epi16(a, 8); }
 inline bits high_halves(bits a) { return _mm_srli_epi64(a, 32); }
+inline bits high_shorts(bits a) { return _mm_srai_epi32(a, 16); } // with their sign
 inline bits madd(bits a, bits b) { return _mm_madd_epi16(a, b); }
 inline bits sad(bits a, bits b) { return _mm_sad_epu8(a, b); }
 #endif
