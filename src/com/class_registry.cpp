@@ -1,13 +1,16 @@
 #include "zelt/com/class_registry.h"
 
 #include "com/implements.h"
-#include "com/server_locks.h"
+#include "com/known_classes.h"
+#include "com/module_use.h"
 
 #include <atomic>
 #include <mutex>
 #include <new>
 
 namespace Qor {
+
+constinit std::atomic<LONG> live_objects{0};
 
 namespace {
 
@@ -25,11 +28,6 @@ const class_entry* find(Test test) noexcept
     for (const class_registration* r = first; r; r = r->next())
         if (test(r->entry())) return &r->entry();
     return nullptr;
-}
-
-const class_entry* find_class(const GUID& id) noexcept
-{
-    return find([&](const class_entry& entry) { return entry.class_id == id; });
 }
 
 constexpr wchar_t lower(wchar_t c) noexcept
@@ -81,6 +79,11 @@ private:
 };
 
 } // namespace
+
+const class_entry* find_class(const GUID& class_id) noexcept
+{
+    return find([&](const class_entry& entry) { return entry.class_id == class_id; });
+}
 
 class_registration::class_registration(const class_entry& entry) noexcept : entry_(entry)
 {

@@ -2,6 +2,7 @@
 #pragma once
 
 #include "com/invoke.h"
+#include "com/module_use.h"
 #include "zelt/com/dispatch.h"
 #include "zelt/com/interface_table.h"
 
@@ -59,6 +60,7 @@ protected:
 
 private:
     std::atomic<ULONG> references_{1};
+    [[no_unique_address]] counted_life life_;
 };
 
 /// The description of an interface; each is defined beside its table.
@@ -172,6 +174,7 @@ private:
 
     own_unknown inner_;
     IUnknown* outer_;
+    [[no_unique_address]] counted_life life_;
 };
 
 /// The same object for script hosts: methods that take images accept calls that leave optional images out.

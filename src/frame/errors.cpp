@@ -59,7 +59,13 @@ const char* system_message(HRESULT code) noexcept
     case E_INVALIDARG: return "invalid argument";
     case E_SIZE_MISMATCH: return "sizes differ";
     case CLASS_E_NOAGGREGATION: return "the class cannot be part of another object";
+    case CLASS_E_CLASSNOTAVAILABLE: return "class not available";
+    case REGDB_E_READREGDB: return "registration cannot be read";
+    case REGDB_E_WRITEREGDB: return "registration cannot be written";
+    case REGDB_E_INVALIDVALUE: return "registration is damaged";
     case REGDB_E_CLASSNOTREG: return "class not registered";
+    case CO_E_DLLNOTFOUND: return "module not found";
+    case CO_E_ERRORINDLL: return "not a module";
     case CO_E_CLASSSTRING: return "unknown class name";
     case DISP_E_MEMBERNOTFOUND: return "no such method or property";
     case DISP_E_PARAMNOTFOUND: return "no such argument";
