@@ -1,11 +1,11 @@
 #include "zelt/com/class_registry.h"
 
+#include "com/held_over_fork.h"
 #include "com/implements.h"
 #include "com/known_classes.h"
 #include "com/module_use.h"
 
 #include <atomic>
-#include <mutex>
 #include <new>
 
 namespace Qor {
@@ -16,6 +16,7 @@ namespace {
 
 // Ready before any constructor of a static object runs, in whatever order those come.
 constinit std::mutex registry_mutex;
+const held_over_fork<registry_mutex> registry_is_fork_safe;
 constinit class_registration* first = nullptr;
 constinit std::atomic<LONG> server_locks{0};
 

@@ -1,9 +1,9 @@
 #include "frame/exception_translator.h"
 
+#include "com/held_over_fork.h"
 #include "frame/errors.h"
 #include "zelt/com/error_info.h"
 
-#include <mutex>
 #include <new>
 #include <typeinfo>
 
@@ -89,18 +89,15 @@ struct chain {
     element<std::exception> outermost{of_exception, casts};
 };
 
-std::mutex& chain_mutex()
-{
-    static std::mutex m;
-    return m;
-}
+constinit std::mutex chain_mutex;
+const held_over_fork<chain_mutex> chain_is_fork_safe;
 
 } // namespace
 
 HResultException TranslateCurrentException()
 {
     try {
-        const std::lock_guard lock(chain_mutex());
+        const std::lock_guard lock(chain_mutex);
         static const chain translators;
         return translators.outermost.translate();
     } catch (...) {

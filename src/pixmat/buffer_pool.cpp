@@ -1,7 +1,8 @@
 #include "pixmat/buffer_pool.h"
 
+#include "com/held_over_fork.h"
+
 #include <algorithm>
-#include <mutex>
 #include <type_traits>
 #include <utility>
 
@@ -61,7 +62,6 @@ block map(size_t bytes) noexcept
 // Oldest first. Lives as long as the process and is never destroyed, so that an image that a static object
 // holds may go at any time.
 struct block_pool {
-    std::mutex mutex;
     block waiting[most_pooled_blocks];
     int count;
     size_t bytes;
@@ -78,15 +78,23 @@ struct block_pool {
 };
 static_assert(std::is_trivially_destructible_v<block_pool>);
 constinit block_pool pool{};
+constinit std::mutex pool_mutex; // for all of the pool
 
 struct end_of_process {
     ~end_of_process()
     {
-        const std::lock_guard lock(pool.mutex);
+        const std::lock_guard lock(pool_mutex);
         pool.closed = true;
         while (pool.count > 0) unmap(pool.remove(pool.count - 1));
     }
 } const end_of_pool;
+
+/// A child starts with an empty pool: blocks that wait are its parent's memory, and writing to them costs a copy.
+void forget_blocks_of_parent() noexcept
+{
+    while (pool.count > 0) unmap(pool.remove(pool.count - 1));
+}
+const held_over_fork<pool_mutex, forget_blocks_of_parent> fork_safe;
 
 } // namespace
 
@@ -94,7 +102,7 @@ mapped_block take_block(size_t at_least) noexcept
 {
     if (at_least > PTRDIFF_MAX - 2 * huge_page) return {};
     {
-        const std::lock_guard lock(pool.mutex);
+        const std::lock_guard lock(pool_mutex);
         int best = -1;
         for (int i = 0; i < pool.count; ++i) {
             const size_t bytes = pool.waiting[i].bytes;
@@ -117,7 +125,7 @@ void give_block(uint8_t* base, size_t bytes) noexcept
     block too_much[most_pooled_blocks + 1];
     int count = 0;
     {
-        const std::lock_guard lock(pool.mutex);
+        const std::lock_guard lock(pool_mutex);
         if (pool.closed || bytes > most_pooled_bytes) {
             too_much[count++] = {base, bytes};
         } else {
@@ -133,7 +141,7 @@ void give_block(uint8_t* base, size_t bytes) noexcept
 
 size_t pooled_bytes() noexcept
 {
-    const std::lock_guard lock(pool.mutex);
+    const std::lock_guard lock(pool_mutex);
     return pool.bytes;
 }
 
