@@ -92,6 +92,11 @@ call_values::~call_values()
         if (!(borrowed_ >> i & 1)) VariantClear(&values_[i]);
 }
 
+void call_values::out_of_range(const parameter& p) const
+{
+    throw raised(PyExc_OverflowError, std::string(method_.name) + "(): " + p.info->name + " is out of range");
+}
+
 void call_values::refuse(const parameter& p, PyObject* value, const char* wanted) const
 {
     throw raised(PyExc_TypeError, std::string(method_.name) + "(): " + p.info->name + " must be " + wanted +
@@ -178,7 +183,9 @@ void call_values::set_real(const parameter& p, VARIANT& v, PyObject* value)
 {
     const double number = PyFloat_AsDouble(value);
     if (number == -1 && PyErr_Occurred()) {
+        const bool too_large = PyErr_ExceptionMatches(PyExc_OverflowError);
         PyErr_Clear();
+        if (too_large) out_of_range(p);
         refuse(p, value, "a number");
     }
     v.vt = VT_R8;
@@ -192,7 +199,9 @@ void call_values::set_whole(const parameter& p, VARIANT& v, PyObject* value)
             v = variant(static_cast<int32_t>(*type)).detach(); // "VT_R4" as the number that it stands for
             return;
         }
-    if (!PyIndex_Check(value)) refuse(p, value, "a whole number");
+    // True and False count as whole numbers to Python; in the place of a size or a position they are a mistake.
+    const bool truth = PyBool_Check(value) || Py_TYPE(value)->tp_name == std::string_view("numpy.bool_");
+    if (truth || !PyIndex_Check(value)) refuse(p, value, "a whole number");
     const py::object number = py::reinterpret_steal<py::object>(PyNumber_Index(value));
     if (!number) throw py::error_already_set();
     VARIANT wide = empty_variant();
@@ -200,9 +209,7 @@ void call_values::set_whole(const parameter& p, VARIANT& v, PyObject* value)
     wide.llVal = PyLong_AsLongLong(number.ptr());
     const bool beyond = PyErr_Occurred();
     if (beyond) PyErr_Clear();
-    if (beyond || failed(VariantChangeType(&v, &wide, 0, p.info->type)))
-        throw raised(PyExc_OverflowError,
-                     std::string(method_.name) + "(): " + p.info->name + " is out of range");
+    if (beyond || failed(VariantChangeType(&v, &wide, 0, p.info->type))) out_of_range(p);
 }
 
 void call_values::set_enumeration(const parameter& p, VARIANT& v, PyObject* value)

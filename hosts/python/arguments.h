@@ -60,6 +60,7 @@ public:
 
 private:
     [[noreturn]] void refuse(const parameter& p, PyObject* value, const char* wanted) const;
+    [[noreturn]] void out_of_range(const parameter& p) const;
     void set_image(const parameter& p, VARIANT& v, PyObject* value);
     void set_value(const parameter& p, VARIANT& v, PyObject* value);
     void set_object(const parameter& p, VARIANT& v, PyObject* value);

@@ -87,6 +87,29 @@ com_ptr<IDispatch> object_of(const py::object& element)
     return host::make_complex({c.real, c.imag});
 }
 
+/// Numbers as elements of another type, none of them changed but in the last digits of real ones.
+py::array numbers_as(py::array a, const char* dtype)
+{
+    using namespace py::literals;
+    const py::object numpy = py::module_::import("numpy");
+    if (a.dtype().kind() == 'O') a = numpy.attr("asarray")(a.attr("tolist")()).cast<py::array>();
+    const char from = a.dtype().kind(), to = py::dtype(dtype).kind();
+    if (std::string_view("biuf").find(from) == std::string_view::npos)
+        throw raised(PyExc_TypeError,
+                     from == 'O' ? "an array of Python objects that are not all numbers"
+                                 : "an array of " + printed(a.dtype()) + " where real numbers are wanted");
+    if (to != 'f' && a.size() > 0 && !a.dtype().is(py::dtype(dtype)) && from != 'b') {
+        if (from == 'f' && !numpy.attr("equal")(a, numpy.attr("rint")(a)).attr("all")().cast<bool>())
+            throw raised(PyExc_ValueError, "an array with fractions or NaN where whole numbers are wanted");
+        const py::object limits = numpy.attr("iinfo")(dtype);
+        if (a.attr("min")().attr("item")() < limits.attr("min") ||
+            a.attr("max")().attr("item")() > limits.attr("max"))
+            throw raised(PyExc_OverflowError,
+                         "an array with numbers out of the range of " + printed(py::dtype(dtype)));
+    }
+    return numpy.attr("ascontiguousarray")(a, "dtype"_a = dtype).cast<py::array>();
+}
+
 py::array array_of(SAFEARRAY* array, const char* dtype, std::vector<py::ssize_t> shape)
 {
     void* data = nullptr;
@@ -140,8 +163,7 @@ safe_array to_safe_array(py::handle values, VARTYPE element)
     if (a.ndim() == 0) throw raised(PyExc_TypeError, "a single value is no array");
     const VARTYPE type = element == VT_EMPTY ? natural_type(a, from_array) : element;
     if (const char* dtype = dtype_of(type)) {
-        using namespace py::literals;
-        a = numpy.attr("ascontiguousarray")(a, "dtype"_a = dtype).cast<py::array>();
+        a = numbers_as(std::move(a), dtype);
         safe_array made = create(type, a);
         const safe_array_access<char> target(made.get());
         if (a.nbytes() > 0) std::memcpy(target.data(), a.data(), static_cast<size_t>(a.nbytes()));

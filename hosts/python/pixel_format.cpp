@@ -54,6 +54,9 @@ void check_elements(const py::array& a)
         refuse(PyExc_TypeError,
                name() + " pixels are not known; array.astype('complex128') makes a copy that is");
     case 'b': refuse(PyExc_TypeError, "bool pixels are not known; array.view('uint8') has 0 and 1 instead");
+    case 'O':
+        refuse(PyExc_TypeError,
+               "Python objects are no pixels; array.astype('float64') makes a copy that has numbers");
     default: refuse(PyExc_TypeError, name() + " pixels are not known");
     }
     if (!(a.flags() & py::detail::npy_api::NPY_ARRAY_ALIGNED_))

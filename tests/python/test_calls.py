@@ -46,6 +46,11 @@ def test_numbers_are_checked_for_kind_and_range(root):
         root.Statistics.Moment(FRAME, 1.0, 0)
     with pytest.raises(OverflowError, match="out of range"):
         root.Statistics.Moment(FRAME, 2**40, 0)
+    for whole in (True, np.True_, float("nan"), "1"):
+        with pytest.raises(TypeError, match="i must be a whole number, not "):
+            root.Statistics.Moment(FRAME, whole, 0)
+    with pytest.raises(OverflowError, match="sigma is out of range"):
+        root.Filters.Gauss(FRAME, 10**400)
     with pytest.raises(TypeError, match="facet|IStatistics"):
         type(root.Statistics).Mean(root.Basic, FRAME)
 
@@ -113,6 +118,27 @@ def test_arrays_keep_type_shape_and_order():
         code = {"i": "VT_I4", "f": "VT_R8", "u": "VT_UI1", "b": "VT_BOOL"}[values.dtype.kind]
         back = zelt.Variant("VT_ARRAY|" + code, values).value
         assert back.dtype == values.dtype and np.array_equal(back, values)
+
+
+@pytest.mark.parametrize("type, values, error, text", [
+    ("VT_I4", np.array([2**31]), OverflowError, "out of the range of int32"),
+    ("VT_UI8", np.array([-1]), OverflowError, "out of the range of uint64"),
+    ("VT_I8", np.array([2**63], "uint64"), OverflowError, "out of the range of int64"),
+    ("VT_I8", np.array([2.0**63]), OverflowError, "out of the range of int64"),
+    ("VT_I4", np.array([np.inf]), OverflowError, "out of the range of int32"),
+    ("VT_I4", np.array([np.nan]), ValueError, "fractions or NaN"), ("VT_UI1", [[0.5]], ValueError, "fractions or NaN"),
+    ("VT_R8", np.array([1j]), TypeError, "complex128 where real"), ("VT_R8", np.array(["1"]), TypeError, "<U1 where real"),
+    ("VT_R8", np.array([1, None], object), TypeError, "not all numbers"),
+])
+def test_arrays_never_change_their_numbers(type, values, error, text):
+    with pytest.raises(error, match=text):
+        zelt.Variant("VT_ARRAY|" + type, values)
+
+
+def test_arrays_of_numbers_of_another_type_are_converted():
+    for type, values in [("VT_I4", np.array([3.0, -2.0])), ("VT_UI8", np.array([2**64 - 1], object)),
+                         ("VT_R8", np.array([1, 2.5], object)), ("VT_UI1", np.array([True])), ("VT_I2", [])]:
+        assert zelt.Variant("VT_ARRAY|" + type, values).value.tolist() == list(values)
 
 
 def test_failures_carry_code_text_and_source(root):
