@@ -4,7 +4,8 @@
 build_packages="build-essential g++ cmake ninja-build ccache pkg-config git
 libopencv-core-dev libopencv-imgproc-dev libopencv-imgcodecs-dev libcfitsio-dev libcli11-dev libsleef-dev
 libgtest-dev libbenchmark-dev
-pybind11-dev python3-dev python3 python3-numpy python3-scipy python3-skimage python3-pytest"
+pybind11-dev python3-dev python3 python3-numpy python3-scipy python3-skimage python3-pytest
+python3-dask python3-distributed"
 
 # Formatting and fuzzing, for those who change the project.
 dev_packages="clang clang-format libclang-rt-14-dev"
