@@ -1,7 +1,7 @@
 #include "zelt/com/class_registry.h"
 
-#include "com/probe.h"
 #include "com/module_use.h"
+#include "com/probe.h"
 
 #include <gtest/gtest.h>
 
