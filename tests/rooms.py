@@ -13,7 +13,7 @@ SOURCES = {".h", ".cpp", ".inl"}
 LAYOUT = "zelt/pixmat/layout.h"
 LOWER = {
     "com": {"zelt/com", "zelt/"},
-    "pixel": {LAYOUT, "zelt/"},
+    "pixel": {"com/held_over_fork.h", LAYOUT, "zelt/"},
     "pixmat": {"com", "pixel", "zelt/com", "zelt/pixmat", "zelt/"},
     "threads": {"com", "pixel", "frame/debug_stream.h", "zelt/com", "zelt/pixmat", "zelt/interfaces", "zelt/"},
     "frame": {"com", "pixel", "pixmat", "threads", "zelt/com", "zelt/pixmat", "zelt/interfaces", "zelt/"},

@@ -2,8 +2,8 @@
 #pragma once
 
 #include "com/implements.h"
+#include "pixel/pixel_buffer.h"
 #include "pixmat/event_sinks.h"
-#include "pixmat/pixel_buffer.h"
 #include "pixmat/statistics_store.h"
 #include "zelt/pixmat/pixmat.h"
 

@@ -1,6 +1,6 @@
 // A fork while other threads are inside the library: the child can use all of it.
 #include "frame/exception_translator.h"
-#include "pixmat/buffer_pool.h"
+#include "pixel/buffer_pool.h"
 #include "zelt/com/class_registry.h"
 #include "zelt/zelt.h"
 

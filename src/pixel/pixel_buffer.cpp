@@ -1,4 +1,4 @@
-#include "pixmat/pixel_buffer.h"
+#include "pixel/pixel_buffer.h"
 
 #include <cstring>
 #include <new>

@@ -1,4 +1,4 @@
-#include "pixmat/pixel_buffer.h"
+#include "pixel/pixel_buffer.h"
 
 #include "support/failing_new.h"
 

@@ -1,4 +1,4 @@
-#include "pixmat/buffer_pool.h"
+#include "pixel/buffer_pool.h"
 
 #include "com/held_over_fork.h"
 

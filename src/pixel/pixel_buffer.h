@@ -1,7 +1,7 @@
 // The memory of an image's pixels.
 #pragma once
 
-#include "pixmat/buffer_pool.h"
+#include "pixel/buffer_pool.h"
 
 #include <cstddef>
 #include <cstdint>
