@@ -62,6 +62,11 @@ TEST(Gauss, IsTheRecursionForLargerImages)
         }
 }
 
+TEST(Gauss, IsTheRecursionForAnImageThatNoCacheHolds)
+{
+    expect_definition_of_an_image<uint8_t>({2111, 1003}, memory_layout::packed);
+}
+
 TEST(Gauss, ReadsAllOfASourceThatOverlapsTheOutputBeforeItIsOverwritten)
 {
     const size s{37, 29};

@@ -8,6 +8,8 @@ namespace Qor::Luxar::ZELT::ZELT_LEVEL::gauss {
 
 using Filters::gauss_differences;
 
+inline constexpr int64_t columns_at_once = 512;
+
 /// The rows of a smoothed image around one of them.
 template <class S>
 struct rows_around {

@@ -15,7 +15,7 @@ namespace Qor::Luxar::ZELT::ZELT_LEVEL {
 
 extern const Filters::gauss_table gauss_loops;
 const Filters::gauss_table gauss_loops{
-    .rows_at_once = gauss::rows_at_once,
+    .lines_at_once = gauss::block,
     .rows_and_down = ZELT_REAL_TYPES(gauss::rows_and_down),
     .up = ZELT_REAL_TYPES(gauss::up),
     .up_colour = gauss::up_as<float, gauss::limited<uint8_t>>,

@@ -1,12 +1,16 @@
 #include "filters/kernels/gauss_smoothing.h"
 
 #include <cstring>
+#include <new>
 
 namespace Qor::Luxar::ZELT::Filters {
 namespace {
 
 /// In front of each row and behind it, in elements.
 constexpr int64_t margin = 16;
+
+/// A scratch of more bytes than this is written past the cache: it would not find all of it there anyway.
+constexpr int64_t most_cached_bytes = int64_t{8} << 20;
 
 template <class T>
 void clamp_row(uint8_t* first, int64_t width)
@@ -16,18 +20,41 @@ void clamp_row(uint8_t* first, int64_t width)
     row[width + 1] = row[width] = row[width - 1];
 }
 
+int64_t in_blocks(int64_t width)
+{
+    const int64_t block = gauss_level().lines_at_once;
+    return (width + block - 1) / block * block;
+}
+
+/// Uninitialised.
+pixel_buffer memory_of(int64_t elements, int64_t bytes_of_one)
+{
+    auto memory =
+        pixel_buffer::allocate(static_cast<size_t>(elements * bytes_of_one), pixel_buffer::uninitialised);
+    if (!memory) throw std::bad_alloc();
+    return memory;
+}
+
 } // namespace
 
 smoothing::smoothing(size s, pixel_type element, const recursion& filter)
-    : size_(s), element_(element), filter_(filter), history_(new double[3 * static_cast<size_t>(s.width)]),
-      lanes_(new double[static_cast<size_t>(s.width) * static_cast<size_t>(gauss_level().rows_at_once)])
+    : size_(s), element_(element), filter_(filter), history_(memory_of(3 * in_blocks(s.width), 8)),
+      lanes_(memory_of(in_blocks(s.width) * gauss_level().lines_at_once, 8))
 {
 }
 
 void smoothing::run(const gauss_plane& src, const gauss_plane& scratch, const gauss_plane& dst,
                     smooth_function up)
 {
-    const gauss_job job{size_.width, size_.height, filter_, src, scratch, dst, history_.get(), lanes_.get()};
+    const gauss_job job{size_.width,
+                        size_.height,
+                        filter_,
+                        src,
+                        scratch,
+                        dst,
+                        reinterpret_cast<double*>(history_.data()),
+                        lanes_.data(),
+                        scratch.y_stride * size_.height > most_cached_bytes};
     gauss_level().rows_and_down[table_index_of(element_)](job);
     up(job);
 }
@@ -35,14 +62,16 @@ void smoothing::run(const gauss_plane& src, const gauss_plane& scratch, const ga
 scratch_image::scratch_image(size s, pixel_type element) : size_(s), plane_()
 {
     const int64_t bytes = element == pixel_type::float_64 ? 8 : 4;
-    const int64_t row = (s.width + 2 * margin) * bytes;
-    memory_.reset(new uint8_t[static_cast<size_t>(row * s.height)]);
-    plane_ = {memory_.get() + margin * bytes, bytes, row};
+    // An odd number of cache lines, so that neighbouring rows do not compete for the same places in a cache.
+    constexpr int64_t line = 64;
+    const int64_t row = ((s.width + 2 * margin) * bytes + line - 1) / line / 2 * 2 * line + line;
+    memory_ = memory_of(row * s.height, 1);
+    plane_ = {memory_.data() + margin * bytes, bytes, row};
 }
 
 void scratch_image::clear() noexcept
 {
-    std::memset(memory_.get(), 0, static_cast<size_t>(plane_.y_stride * size_.height));
+    std::memset(memory_.data(), 0, static_cast<size_t>(plane_.y_stride * size_.height));
 }
 
 void scratch_image::clamp_rows() noexcept

@@ -3,8 +3,8 @@
 
 #include "filters/kernels/gauss_levels.h"
 #include "filters/kernels/operands.h"
+#include "pixel/pixel_buffer.h"
 
-#include <memory>
 #include <optional>
 
 namespace Qor::Luxar::ZELT::Filters {
@@ -27,8 +27,8 @@ private:
     size size_;
     pixel_type element_;
     recursion filter_;
-    std::unique_ptr<double[]> history_;
-    std::unique_ptr<double[]> lanes_; // a double's size suits both kinds of scratch
+    pixel_buffer history_;
+    pixel_buffer lanes_; // a double's size suits both kinds of scratch
 };
 
 /// Rows of floats, or of doubles for double pixels, with room for clamped pixels beside them; not filled.
@@ -46,7 +46,7 @@ public:
 private:
     size size_;
     gauss_plane plane_;
-    std::unique_ptr<uint8_t[]> memory_;
+    pixel_buffer memory_;
 };
 
 /// A channel smoothed, for differences of it.

@@ -18,8 +18,8 @@ struct gauss_plane {
     int64_t y_stride;
 };
 
-/// A smoothing. The scratch holds floats, or doubles for double images, next to each other in a row; it may be the
-/// destination. History and lanes are working memory of the sizes that the table tells.
+/// A smoothing. The scratch holds floats, or doubles for double images, next to each other in a row; rows start with
+/// a line of the cache. It may be the destination. History and lanes are working memory of the sizes that the table tells.
 struct gauss_job {
     int32_t width;
     int32_t height;
@@ -29,6 +29,7 @@ struct gauss_job {
     gauss_plane dst;
     double* history;
     void* lanes;
+    bool beyond_cache; ///< no cache holds the scratch until the last pass
 };
 using smooth_function = void (*)(const gauss_job&);
 
@@ -44,9 +45,9 @@ using difference_function = void (*)(const gauss_differences&);
 
 /// Arrays are by type: unsigned 8, 16, 32 bit, signed 8, 16, 32 bit, float, double.
 struct gauss_table {
-    /// Rows that go through the recursion together: `lanes` has as many scratch elements for each column,
-    /// `history` three numbers for each column.
-    int32_t rows_at_once;
+    /// Lines that go through the recursion side by side. For each column, in whole blocks of as many, `lanes` has
+    /// as many elements as well and `history` three numbers.
+    int64_t lines_at_once;
 
     smooth_function rows_and_down[8]; ///< from the source into the scratch, all but the last pass
     smooth_function up[8];            ///< from the scratch into the destination: cut, and not limited

@@ -4,6 +4,9 @@
 #include "pixel/level.h"
 
 #include <cstdint>
+#ifdef __SSE2__
+#include <immintrin.h>
+#endif
 
 namespace Qor::Luxar::ZELT::ZELT_LEVEL::filters {
 
@@ -30,9 +33,50 @@ ZELT_INLINE doubles load_vector(const float* from)
     typedef float half __attribute__((vector_size(vector_bytes / 2)));
     half v;
     __builtin_memcpy(&v, from, sizeof v);
+#if defined(__AVX512F__)
+    return _mm512_maskz_cvtps_pd(0xFF, v); // compilers make four instructions of what is below
+#elif defined(__AVX2__)
+    return _mm256_cvtps_pd(v);
+#else
     return __builtin_convertvector(v, doubles);
+#endif
 }
 ZELT_INLINE void store_vector(double* to, doubles v) { __builtin_memcpy(to, &v, sizeof v); }
+ZELT_INLINE void store_vector(float* to, doubles v)
+{
+    typedef float half __attribute__((vector_size(vector_bytes / 2)));
+#if defined(__AVX512F__)
+    const half h = _mm512_maskz_cvtpd_ps(0xFF, v);
+#elif defined(__AVX2__)
+    const half h = _mm256_cvtpd_ps(v);
+#else
+    const half h = __builtin_convertvector(v, half);
+#endif
+    __builtin_memcpy(to, &h, sizeof h);
+}
+
+/// Copies a line of the cache to an aligned place in memory that is not read again soon: past the cache, where that is
+/// possible, which otherwise first reads what is overwritten.
+inline constexpr int64_t line_bytes = 64;
+ZELT_INLINE void stream_line(const void* from, void* to)
+{
+#ifdef __SSE2__
+#if defined(__AVX512F__)
+    typedef __m512i part;
+    const auto stream = [](part* p, part v) { _mm512_stream_si512(p, v); };
+#elif defined(__AVX2__)
+    typedef __m256i part;
+    const auto stream = [](part* p, part v) { _mm256_stream_si256(p, v); };
+#else
+    typedef __m128i part;
+    const auto stream = [](part* p, part v) { _mm_stream_si128(p, v); };
+#endif
+    for (int64_t i = 0; i < line_bytes / int64_t{sizeof(part)}; ++i)
+        stream(static_cast<part*>(to) + i, static_cast<const part*>(from)[i]);
+#else
+    __builtin_memcpy(to, from, line_bytes);
+#endif
+}
 
 /// Count vectors. They nest instead of being an array: compilers keep what has a name in registers, and put
 /// into memory what is counted.
