@@ -86,7 +86,7 @@ void store_run(const run_of_sums<int32_t>& sums, int64_t count, contiguous_row<T
 // Elsewhere the root of the rounded squares is within two units in the last place of what hypot gives. Where that cannot
 // change the pixel hypot is spared: it is many times slower.
 
-inline constexpr int64_t units_apart = 4;
+inline constexpr uint64_t units_apart = 4;
 
 /// 32 bits: cutting tells them apart only beside a whole number. A single difference has an exact root.
 template <class T>
@@ -118,18 +118,18 @@ inline void store_run(const run_of_sums<double>& sums, int64_t count, contiguous
 /// floats lose bits. Squares of floats are exact and stay in the range of doubles.
 inline void store_run(const run_of_sums<float>& sums, int64_t count, contiguous_row<float> to)
 {
-    bool doubtful = false;
+    uint64_t doubtful = 0; // as wide as a root, which makes vectors of both
     for (int64_t i = 0; i < count; ++i) {
         const double a = sums.a[i], b = sums.b[i];
         const double root = __builtin_sqrt(a * a + b * b);
-        int64_t bits;
+        uint64_t bits;
         __builtin_memcpy(&bits, &root, sizeof bits);
-        const int64_t from_middle = (bits & 0x1FFFFFFF) - 0x10000000;
-        doubtful |=
-            (from_middle >= -units_apart && from_middle <= units_apart) || !(root >= 0x1p-126 || root == 0);
+        const uint64_t above_middle = (bits & 0x1FFFFFFF) - (0x10000000 - units_apart);
+        doubtful |= above_middle <= 2 * units_apart ? 1 : 0;
+        doubtful |= root >= 0x1p-126 || root == 0 ? 0 : 1;
         to[i] = static_cast<float>(root);
     }
-    if (!doubtful) return;
+    if (doubtful == 0) return;
     for (int64_t i = 0; i < count; ++i) to[i] = static_cast<float>(__builtin_hypot(sums.a[i], sums.b[i]));
 }
 
