@@ -99,11 +99,22 @@ template <int Count>
 struct tile<0, Count> {
 };
 
+/// Compilers are not to load again what is used several times: a load that crosses lines of the cache costs two.
+ZELT_INLINE void keep([[maybe_unused]] doubles& v)
+{
+#if defined(__AVX512F__)
+    __asm__("" : "+v"(v));
+#elif defined(__SSE2__)
+    __asm__("" : "+x"(v));
+#endif
+}
+
 template <int Count, class E>
 ZELT_INLINE void load(vectors<Count>& to, const E* from)
 {
     if constexpr (Count > 0) {
         to.v = load_vector(from);
+        keep(to.v);
         load(to.more, from + lanes);
     }
 }
