@@ -26,13 +26,27 @@ struct rows_around {
     S operator()(int64_t x, int64_t dx, int64_t dy) const { return row[2 + dy][x + dx]; }
 };
 
-/// The hypotenuse in single precision: in double, where the squares are exact, and rounded once.
+inline uint64_t bits_of(double v)
+{
+    uint64_t bits;
+    __builtin_memcpy(&bits, &v, sizeof bits);
+    return bits;
+}
+
+/// The hypotenuse in single precision: in double, where the squares are exact, and rounded once. It is infinite with an
+/// infinite side, whatever the other is. A mask chooses: compilers would put the root into a branch, one at a time.
 inline float hypotenuse(float a, float b)
 {
+    constexpr uint64_t infinity = 0x7FF0000000000000;
     const double x = a, y = b;
-    const double length = __builtin_sqrt(x * x + y * y);
-    const bool infinite = __builtin_fabsf(a) == __builtin_inff() || __builtin_fabsf(b) == __builtin_inff();
-    return infinite ? __builtin_inff() : static_cast<float>(length);
+    const uint64_t length = bits_of(__builtin_sqrt(x * x + y * y));
+    const uint64_t x_infinite = bits_of(__builtin_fabs(x)) == infinity;
+    const uint64_t y_infinite = bits_of(__builtin_fabs(y)) == infinity;
+    const uint64_t mask = 0 - (x_infinite | y_infinite);
+    const uint64_t chosen = (length & ~mask) | (infinity & mask);
+    double result;
+    __builtin_memcpy(&result, &chosen, sizeof result);
+    return static_cast<float>(result);
 }
 
 /// sqrt(2) |v|, correctly rounded: the product and the rest of the constant are added with what the product lost.
@@ -50,12 +64,16 @@ inline double times_sqrt_2(double v)
     return sum == sum ? sum : product; // infinite, NaN, or too large to be split
 }
 
+/// Two differences, in single precision, whose hypotenuse is wanted.
+struct sides {
+    float x, y;
+};
+
 struct of_gradient {
     template <class S>
-    static float at(const rows_around<S>& s, int64_t x)
+    static sides at(const rows_around<S>& s, int64_t x)
     {
-        return hypotenuse(static_cast<float>(s(x, 1, 0) - s(x, -1, 0)),
-                          static_cast<float>(s(x, 0, 1) - s(x, 0, -1)));
+        return {static_cast<float>(s(x, 1, 0) - s(x, -1, 0)), static_cast<float>(s(x, 0, 1) - s(x, 0, -1))};
     }
 };
 
@@ -82,9 +100,9 @@ inline S first_y(const rows_around<S>& s, int64_t x)
 
 struct of_laplacian {
     template <class S>
-    static float at(const rows_around<S>& s, int64_t x)
+    static sides at(const rows_around<S>& s, int64_t x)
     {
-        return hypotenuse(static_cast<float>(second_x(s, x)), static_cast<float>(second_y(s, x)));
+        return {static_cast<float>(second_x(s, x)), static_cast<float>(second_y(s, x))};
     }
 };
 
@@ -100,6 +118,27 @@ struct of_sdgd {
     }
 };
 
+template <class Operation, class T, class S>
+void store_differences(const rows_around<S>& around, int64_t left, int64_t count, uint8_t* to, int64_t stride)
+{
+    using result = decltype(Operation::at(around, 0));
+    if constexpr (requires(result r) { r.x; }) {
+        // In memory in between: GCC 12 takes a float between two doubles for a double in the rest of some loops.
+        float x[columns_at_once], y[columns_at_once], lengths[columns_at_once];
+        for (int64_t i = 0; i < count; ++i) {
+            const sides s = Operation::at(around, left + i);
+            x[i] = s.x;
+            y[i] = s.y;
+        }
+        for (int64_t i = 0; i < count; ++i) lengths[i] = hypotenuse(x[i], y[i]);
+        store<limited<T>>(lengths, count, to, stride);
+    } else {
+        result results[columns_at_once];
+        for (int64_t i = 0; i < count; ++i) results[i] = Operation::at(around, left + i);
+        store<limited<T>>(results, count, to, stride);
+    }
+}
+
 /// Operation is of each pixel; the results are limited to the type T.
 template <class Operation, class T, class S>
 void each_difference(const gauss_differences& d)
@@ -109,10 +148,8 @@ void each_difference(const gauss_differences& d)
         const rows_around<S> around(d, y);
         for (int64_t left = 0; left < width; left += columns_at_once) {
             const int64_t count = width - left < columns_at_once ? width - left : columns_at_once;
-            decltype(Operation::at(around, 0)) results[columns_at_once];
-            for (int64_t i = 0; i < count; ++i) results[i] = Operation::at(around, left + i);
-            store<limited<T>>(results, count, d.dst.first + y * d.dst.y_stride + left * d.dst.x_stride,
-                              d.dst.x_stride);
+            uint8_t* const to = d.dst.first + y * d.dst.y_stride + left * d.dst.x_stride;
+            store_differences<Operation, T>(around, left, count, to, d.dst.x_stride);
         }
     }
 }
