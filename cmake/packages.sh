@@ -13,6 +13,9 @@ dev_packages="clang clang-format libclang-rt-14-dev"
 # The site of the documentation.
 docs_packages="mkdocs mkdocs-material"
 
+# Making Debian packages and looking for faults in them.
+package_packages="dpkg-dev file lintian"
+
 # Installs those of the named packages that are missing; says nothing and touches nothing if none is.
 need_packages() {
     missing=
