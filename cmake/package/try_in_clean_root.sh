@@ -32,7 +32,7 @@ quietly apt-get install -y --no-install-recommends /packages/*.deb
 echo "installed: $(dpkg-query -W -f '${Package} ' '*zelt*')"
 cd /tmp
 zelt --version
-zelt call Basic.Add new:64x48x16 100 -o sum.tif
+zelt call Basic.Add new:64x48:Unsigned:16 100 -o sum.tif
 zelt stats sum.tif --json
 /usr/bin/python3 -c '
 import numpy, zelt
