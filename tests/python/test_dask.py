@@ -146,6 +146,23 @@ def test_a_lost_worker_loses_no_frame(client):
     assert set(client.run(os.getpid).values()) != set(processes.values())
 
 
+def received(dask_worker):
+    """Keys that came to a worker from others, as often as they came."""
+    return [str(key) for transfer in dask_worker.transfer_incoming_log for key in transfer["keys"]]
+
+
+def test_a_reference_goes_to_a_worker_once(client):
+    dark = DARK + 1  # of this test alone
+    stack = dask.array.from_array(np.tile(STACK, (3, 1, 1)), chunks=(1, -1, -1)).map_blocks(slowly, dtype=STACK.dtype)
+    client.run(lambda dask_worker: dask_worker.transfer_incoming_log.clear())
+    done = zelt.dask.apply(zelt.dask.correction(dark, encoding="Signed"), stack).persist()
+    distributed.wait(done)
+    came = [[key for key in keys if "zelt-reference" in key] for keys in client.run(received).values()]
+    assert sorted(map(len, came)) == [0, 1], came  # one worker has it from the scheduler, the other from that one
+    places = {worker for where in client.who_has(done).values() for worker in where}
+    assert len(places) == 2
+
+
 @pytest.mark.parametrize("way", [[], ["--files"]])
 def test_the_example_evens_a_stack(tmp_path, way):
     script = pathlib.Path(__file__).parents[2] / "examples/correct_stack.py"

@@ -2,6 +2,7 @@
 
 import multiprocessing
 import os
+import signal
 import subprocess
 import sys
 import threading
@@ -136,6 +137,37 @@ def test_a_child_uses_the_objects_of_its_parent():
     assert answer.get(timeout=60) == ((64, 64), FRAME.mean())
     child.join(60)
     assert child.exitcode == 0
+
+
+def test_a_child_works_though_threads_of_its_parent_were_at_work():
+    big, stop = np.ones((1500, 1500), "uint16"), threading.Event()
+
+    def work():
+        root = zelt.create("ZELT.Main2")
+        while not stop.is_set():
+            root.Basic.Add(big, 1)
+            with pytest.raises(zelt.Error):
+                root.Basic.Add(big, FRAME)
+
+    threads = [threading.Thread(target=work) for _ in range(2)]
+    for t in threads:
+        t.start()
+    try:
+        for _ in range(20):
+            child = os.fork()
+            if child == 0:
+                signal.alarm(60)  # a child that hangs is ended
+                root = zelt.create("ZELT.Main2")
+                try:
+                    root.Basic.Add(big, FRAME)
+                except zelt.Error:
+                    os._exit(0 if (np.asarray(root.Basic.Add(big, 1)) == 2).all() else 1)
+                os._exit(2)
+            assert os.waitpid(child, 0)[1] == 0
+    finally:
+        stop.set()
+        for t in threads:
+            t.join()
 
 
 INTERRUPTED = """
