@@ -1,5 +1,6 @@
 """What holds over time and across threads and processes."""
 
+import contextlib
 import multiprocessing
 import os
 import signal
@@ -86,6 +87,37 @@ def test_other_threads_run_on_during_a_call():
         done.set()
         ticker.join()
     assert counted > 10
+
+
+def runnable_threads():
+    """How many threads of this process, besides this one, want a processor: a count that a busy machine leaves alone."""
+    count = 0
+    for thread in os.listdir("/proc/self/task"):
+        with contextlib.suppress(FileNotFoundError, ProcessLookupError), open(f"/proc/self/task/{thread}/stat") as file:
+            count += int(thread) != threading.get_native_id() and file.read().rsplit(")", 1)[1].split()[0] == "R"
+    return count
+
+
+def test_eight_threads_work_at_once():
+    filters, stop = zelt.create("ZELT.Main2").Filters, threading.Event()
+
+    def work():
+        frame = np.ones((800, 800), "float32")
+        while not stop.is_set():
+            filters.Gauss(frame, 2.0)
+
+    threads = [threading.Thread(target=work) for _ in range(8)]
+    for t in threads:
+        t.start()
+    seen = []
+    for _ in range(100):
+        time.sleep(0.005)
+        seen.append(runnable_threads())
+    stop.set()
+    for t in threads:
+        t.join()
+    # Threads that wait for the interpreter or for a lock sleep: one at a time would be 1.
+    assert np.mean(seen) > 4, seen
 
 
 def test_threads_share_a_facet():
