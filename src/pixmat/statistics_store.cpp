@@ -6,16 +6,26 @@
 namespace Qor::Luxar {
 namespace {
 
+// What the scalar statistics of an image come to.
+constexpr size_t usual_keys = 16, usual_length = 16;
+
 std::wstring_view text_of(BSTR key) noexcept { return {key, SysStringLen(key)}; }
 
-template <class Entries>
-auto place_of(Entries& entries, std::wstring_view key) noexcept
+/// From the end: keys of one family begin alike.
+bool same(std::wstring_view a, std::wstring_view b) noexcept
 {
-    return std::lower_bound(entries.begin(), entries.end(), key,
-                            [](const auto& e, std::wstring_view k) { return e.key < k; });
+    return std::equal(a.rbegin(), a.rend(), b.rbegin(), b.rend());
 }
 
 } // namespace
+
+const statistics_store::entry* statistics_store::find(std::wstring_view key) const noexcept
+{
+    const std::wstring_view keys = keys_;
+    for (const entry& e : entries_)
+        if (same(keys.substr(e.key_begin, e.key_length), key)) return &e;
+    return nullptr;
+}
 
 HRESULT statistics_store::set(BSTR key, const VARIANT* value) noexcept
 {
@@ -25,11 +35,18 @@ HRESULT statistics_store::set(BSTR key, const VARIANT* value) noexcept
     try {
         const std::lock_guard lock(mutex_);
         const std::wstring_view text = text_of(key);
-        const auto place = place_of(entries_, text);
-        if (place != entries_.end() && place->key == text)
-            std::swap(place->value, held);
-        else
-            entries_.insert(place, entry{std::wstring(text), std::move(held)});
+        if (const entry* known = find(text)) {
+            std::swap(entries_[static_cast<size_t>(known - entries_.data())].value, held);
+        } else {
+            if (entries_.empty()) {
+                entries_.reserve(usual_keys);
+                keys_.reserve(usual_keys * usual_length);
+            }
+            const size_t begin =
+                entries_.empty() ? 0 : entries_.back().key_begin + entries_.back().key_length;
+            keys_.replace(begin, keys_.npos, text); // of a key that found no memory for its entry, too
+            entries_.push_back({begin, text.size(), std::move(held)});
+        }
         any_.store(true, std::memory_order_release);
         return S_OK;
     } catch (...) {
@@ -44,10 +61,8 @@ HRESULT statistics_store::get(BSTR key, VARIANT* value) const noexcept
     if (!key) return E_POINTER;
     if (!any_.load(std::memory_order_acquire)) return S_FALSE;
     const std::lock_guard lock(mutex_);
-    const std::wstring_view text = text_of(key);
-    const auto place = place_of(entries_, text);
-    if (place == entries_.end() || place->key != text) return S_FALSE;
-    return VariantCopy(value, place->value.get());
+    const entry* known = find(text_of(key));
+    return known ? VariantCopy(value, known->value.get()) : S_FALSE;
 }
 
 void statistics_store::drop() noexcept
@@ -57,6 +72,7 @@ void statistics_store::drop() noexcept
     {
         const std::lock_guard lock(mutex_);
         old.swap(entries_);
+        keys_.clear();
         any_.store(false, std::memory_order_release);
     }
 }

@@ -6,6 +6,7 @@
 #include <atomic>
 #include <mutex>
 #include <string>
+#include <string_view>
 #include <vector>
 
 namespace Qor::Luxar {
@@ -21,14 +22,19 @@ public:
     void drop() noexcept;
 
 private:
+    // An image has a dozen keys or two, often written all at once: the texts stand behind one another, so that a key
+    // needs no memory of its own, and a search goes through all of them.
     struct entry {
-        std::wstring key;
+        size_t key_begin;
+        size_t key_length;
         variant value;
     };
+    const entry* find(std::wstring_view key) const noexcept;
 
     std::atomic<bool> any_{false};
     mutable std::mutex mutex_;
-    std::vector<entry> entries_; // sorted by key
+    std::wstring keys_;
+    std::vector<entry> entries_;
 };
 
 } // namespace Qor::Luxar

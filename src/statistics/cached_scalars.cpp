@@ -9,38 +9,40 @@
 namespace Qor::Luxar::ZELT::Statistics {
 namespace {
 
+using key_text = bstr_constant<20>;
+
 /// What a key holds and when it is written. The order is that of the writes.
 struct stored_key {
-    const wchar_t* key;
+    key_text key;
     uint32_t flag;
-    VARTYPE type;
     bool image_statistics::*valid;
 };
 
 constexpr stored_key keys[] = {
-    {L"stats:minimum", flag_minimum, VT_R8, &image_statistics::minimum_valid},
-    {L"stats:mincount", flag_minimum_count, VT_UI4, &image_statistics::minimum_valid},
-    {L"stats:minposx", flag_minimum_x, VT_I4, &image_statistics::minimum_valid},
-    {L"stats:minposy", flag_minimum_y, VT_I4, &image_statistics::minimum_valid},
-    {L"stats:maximum", flag_maximum, VT_R8, &image_statistics::maximum_valid},
-    {L"stats:maxcount", flag_maximum_count, VT_UI4, &image_statistics::maximum_valid},
-    {L"stats:maxposx", flag_maximum_x, VT_I4, &image_statistics::maximum_valid},
-    {L"stats:maxposy", flag_maximum_y, VT_I4, &image_statistics::maximum_valid},
-    {L"stats:absmin", flag_range_min, VT_R8, &image_statistics::range_min_valid},
-    {L"stats:absmax", flag_range_max, VT_R8, &image_statistics::range_max_valid},
-    {L"stats:mean", flag_mean, VT_R8, &image_statistics::mean_valid},
-    {L"stats:sumsquares", flag_sum_squares, VT_R8, &image_statistics::sum_squares_valid},
-    {L"stats:gravityx", flag_gravity_x, VT_R8, &image_statistics::gravity_valid},
-    {L"stats:gravityy", flag_gravity_y, VT_R8, &image_statistics::gravity_valid},
+    {L"stats:minimum", flag_minimum, &image_statistics::minimum_valid},
+    {L"stats:mincount", flag_minimum_count, &image_statistics::minimum_valid},
+    {L"stats:minposx", flag_minimum_x, &image_statistics::minimum_valid},
+    {L"stats:minposy", flag_minimum_y, &image_statistics::minimum_valid},
+    {L"stats:maximum", flag_maximum, &image_statistics::maximum_valid},
+    {L"stats:maxcount", flag_maximum_count, &image_statistics::maximum_valid},
+    {L"stats:maxposx", flag_maximum_x, &image_statistics::maximum_valid},
+    {L"stats:maxposy", flag_maximum_y, &image_statistics::maximum_valid},
+    {L"stats:absmin", flag_range_min, &image_statistics::range_min_valid},
+    {L"stats:absmax", flag_range_max, &image_statistics::range_max_valid},
+    {L"stats:mean", flag_mean, &image_statistics::mean_valid},
+    {L"stats:sumsquares", flag_sum_squares, &image_statistics::sum_squares_valid},
+    {L"stats:gravityx", flag_gravity_x, &image_statistics::gravity_valid},
+    {L"stats:gravityy", flag_gravity_y, &image_statistics::gravity_valid},
 };
 
-constexpr const wchar_t* subsample_key = L"stats:subsample";
+constexpr key_text subsample_key = L"stats:subsample";
+constexpr key_text unknown_key = L"Unknown Parameter";
 
-const wchar_t* key_of(statistic_flag flag)
+BSTR key_of(statistic_flag flag)
 {
     for (const stored_key& k : keys)
-        if (k.flag == flag) return k.key;
-    return L"Unknown Parameter";
+        if (k.flag == flag) return k.key.get();
+    return unknown_key.get();
 }
 
 /// The count cut to its low 32 bits.
@@ -64,10 +66,10 @@ variant stored_value(const image_statistics& record, const stored_key& k)
 HRESULT look_up(IPixmatStatisticsStore* store, statistic_flag flag, LONG factor, double* value)
 {
     variant held;
-    if (store->GetValue(bstr(subsample_key).get(), held.put()) != S_OK) return S_FALSE;
+    if (store->GetValue(subsample_key.get(), held.put()) != S_OK) return S_FALSE;
     if (held.type() != VT_I4 && failed(VariantChangeType(held.get(), held.get(), 0, VT_I4))) return S_FALSE;
     if (held->lVal != factor) return S_FALSE;
-    if (store->GetValue(bstr(key_of(flag)).get(), held.put()) != S_OK) return S_FALSE;
+    if (store->GetValue(key_of(flag), held.put()) != S_OK) return S_FALSE;
     if (const HRESULT hr = VariantChangeType(held.get(), held.get(), 0, VT_R8); failed(hr)) return hr;
     *value = held->dblVal;
     return S_OK;
@@ -75,9 +77,9 @@ HRESULT look_up(IPixmatStatisticsStore* store, statistic_flag flag, LONG factor,
 
 void keep(IPixmatStatisticsStore* store, const image_statistics& record, LONG factor)
 {
-    CheckHResult(store->SetValue(bstr(subsample_key).get(), variant(factor).get()));
+    CheckHResult(store->SetValue(subsample_key.get(), variant(factor).get()));
     for (const stored_key& k : keys)
-        if (record.*k.valid) CheckHResult(store->SetValue(bstr(k.key).get(), stored_value(record, k).get()));
+        if (record.*k.valid) CheckHResult(store->SetValue(k.key.get(), stored_value(record, k).get()));
 }
 
 HRESULT scalar_pass(IPixmat2* image, const rectangle* area, statistic_flag flag, LONG factor,

@@ -82,19 +82,23 @@ TEST(StatisticsStore, StaysAsItIsWhenMemoryRunsOut)
 {
     const auto image = small_image();
     const auto store = image.as<IPixmatStatisticsStore>();
-    const bstr old_key(L"old"), new_key(L"a new key that is long");
+    const std::wstring long_text(300, L'k');
+    const bstr old_key(L"old"), new_key(long_text);
     const variant text(L"a text that is long");
     ASSERT_EQ(store->SetValue(old_key.get(), text.get()), S_OK);
+    for (int i = 1; i < 16; ++i) // all the places that a store has at first
+        ASSERT_EQ(store->SetValue(bstr(std::to_wstring(i)).get(), text.get()), S_OK);
     int n = 1;
     for (;; ++n) {
         const HRESULT hr =
             with_failing_allocation(n, [&] { return store->SetValue(new_key.get(), text.get()); });
         if (hr == S_OK) break;
         ASSERT_EQ(hr, E_OUTOFMEMORY) << n;
-        ASSERT_FALSE(has(image.get(), L"a new key that is long"));
+        ASSERT_FALSE(has(image.get(), long_text.c_str()));
         ASSERT_TRUE(has(image.get(), L"old"));
     }
-    EXPECT_GT(n, 2);
+    EXPECT_GT(n, 3);
+    EXPECT_TRUE(has(image.get(), long_text.c_str()));
     variant found;
     EXPECT_EQ(with_failing_allocation(1, [&] { return store->GetValue(old_key.get(), found.put()); }),
               E_OUTOFMEMORY);

@@ -3,6 +3,7 @@
 
 #include "zelt/com/types.h"
 
+#include <cstddef>
 #include <string>
 #include <string_view>
 #include <utility>
@@ -48,6 +49,24 @@ public:
 
 private:
     BSTR text_ = nullptr;
+};
+
+/// A constant text of less than Capacity characters as a BSTR that needs no memory of its own. For arguments only:
+/// nobody may free or change it.
+template <size_t Capacity>
+class bstr_constant {
+public:
+    template <size_t Size>
+        requires(Size <= Capacity)
+    constexpr bstr_constant(const OLECHAR (&text)[Size]) noexcept : length_(Size - 1)
+    {
+        for (size_t i = 0; i < Size; ++i) text_[i] = text[i];
+    }
+    BSTR get() const noexcept { return const_cast<BSTR>(text_); }
+
+private:
+    uint32_t length_; // stands directly before the characters
+    OLECHAR text_[Capacity] = {};
 };
 
 /// Bytes become characters one by one, and back (a character beyond a byte becomes '?').

@@ -125,7 +125,7 @@ public:
         std::swap(v_, other.v_);
         return *this;
     }
-    ~variant() { VariantClear(&v_); }
+    ~variant() { clear(); }
 
     static variant attach(const VARIANT& v) noexcept
     {
@@ -136,7 +136,7 @@ public:
     [[nodiscard]] VARIANT detach() noexcept { return std::exchange(v_, empty_variant()); }
     VARIANT* put() noexcept
     {
-        VariantClear(&v_);
+        clear();
         return &v_;
     }
     VARIANT* get() noexcept { return &v_; }
@@ -145,6 +145,15 @@ public:
     const VARIANT* operator->() const noexcept { return &v_; }
 
 private:
+    /// A number owns nothing: most values need no call.
+    void clear() noexcept
+    {
+        if (v_.vt <= VT_R8)
+            v_ = empty_variant();
+        else
+            VariantClear(&v_);
+    }
+
     VARIANT v_;
 };
 
