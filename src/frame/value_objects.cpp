@@ -1,6 +1,7 @@
 #include "frame/value_objects.h"
 
 #include "com/describe.h"
+#include "pixmat/descriptor.h"
 
 namespace Qor::Luxar::Common {
 namespace {
@@ -57,12 +58,7 @@ HRESULT ReadValue(ICoordinateFloat* object, coordinate<double>* value) noexcept
 
 HRESULT ReadValue(IRectangle* object, rectangle* value) noexcept
 {
-    if (!object) return E_INVALIDARG;
-    HRESULT hr = object->get_Left(&value->left);
-    if (succeeded(hr)) hr = object->get_Top(&value->top);
-    if (succeeded(hr)) hr = object->get_Right(&value->right);
-    if (succeeded(hr)) hr = object->get_Bottom(&value->bottom);
-    return hr;
+    return object ? read_rectangle(object, *value) : E_INVALIDARG;
 }
 
 namespace {

@@ -14,4 +14,13 @@ HRESULT read_layout(IPixmatDescriptor* descriptor, image_layout& layout) noexcep
     return hr;
 }
 
+HRESULT read_rectangle(IRectangle* area, rectangle& r) noexcept
+{
+    HRESULT hr = area->get_Left(&r.left);
+    if (succeeded(hr)) hr = area->get_Top(&r.top);
+    if (succeeded(hr)) hr = area->get_Right(&r.right);
+    if (succeeded(hr)) hr = area->get_Bottom(&r.bottom);
+    return hr;
+}
+
 } // namespace Qor::Luxar

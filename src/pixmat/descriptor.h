@@ -46,5 +46,7 @@ private:
 
 /// Reads the properties of any descriptor; stops at the first failure.
 HRESULT read_layout(IPixmatDescriptor* descriptor, image_layout& layout) noexcept;
+/// The same for any rectangle.
+HRESULT read_rectangle(IRectangle* area, rectangle& r) noexcept;
 
 } // namespace Qor::Luxar

@@ -17,13 +17,11 @@ constexpr int64_t slack = 16;
 
 int64_t pixel_bytes(const image_layout& layout) noexcept { return (int64_t{layout.bits} + 7) / 8; }
 
-HRESULT read_rectangle(IRectangle* area, rectangle& r) noexcept
+/// Rows that are longer than a stride can say, as packed_layout describes them: with the low bits of their length.
+bool has_wrapped_stride(const image_layout& layout) noexcept
 {
-    HRESULT hr = area->get_Left(&r.left);
-    if (succeeded(hr)) hr = area->get_Top(&r.top);
-    if (succeeded(hr)) hr = area->get_Right(&r.right);
-    if (succeeded(hr)) hr = area->get_Bottom(&r.bottom);
-    return hr;
+    const int64_t row = int64_t{layout.x_stride} * layout.width;
+    return row > INT32_MAX && layout.y_stride == static_cast<int32_t>(static_cast<uint32_t>(row));
 }
 
 /// Copies whole pixels of any kind, those without a pixel type included.
@@ -152,6 +150,7 @@ HRESULT create_image(const image_layout& layout, pixel_buffer::fill content, IPi
 {
     *out = nullptr;
     if (layout.width < 0 || layout.height < 0 || layout.bits < 1) return E_INVALIDARG;
+    if (has_wrapped_stride(layout)) return E_INVALIDARG;
     const byte_span span = span_of(layout);
     constexpr auto line = static_cast<int64_t>(pixel_buffer::alignment);
     const int64_t lead = (slack - span.first + line - 1) / line * line;

@@ -53,8 +53,9 @@ struct byte_span {
 };
 byte_span span_of(const image_layout& layout) noexcept;
 
-/// A new image with exactly this layout. E_INVALIDARG for negative sizes and bits below 1, E_OUTOFMEMORY. `content` may
-/// be pixel_buffer::uninitialised when every byte of the layout's span will be written.
+/// A new image with exactly this layout. E_INVALIDARG for negative sizes, bits below 1 and a packed layout whose y
+/// stride does not fit 32 bits; E_OUTOFMEMORY. `content` may be pixel_buffer::uninitialised when every byte of the
+/// layout's span will be written.
 HRESULT create_image(const image_layout& layout, pixel_buffer::fill content, IPixmat2** out) noexcept;
 /// The same, packed: offset and strides do not matter. E_OUTOFMEMORY, too, when a row is longer than 2^31 - 1 bytes.
 HRESULT create_packed_image(const image_layout& layout, pixel_buffer::fill content, IPixmat2** out) noexcept;

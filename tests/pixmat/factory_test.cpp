@@ -50,8 +50,17 @@ TEST(Factory, AnswersSizesBeyondMemoryAtOnce)
         << "its row does not fit a stride";
 }
 
+TEST(Factory, RefusesPackedRowsWhoseStrideHasWrapped)
+{
+    com_ptr<IPixmat2> image;
+    for (const image_layout& l : {packed_layout(1 << 29, 1, 64, PixmatEncoding_Float),
+                                  packed_layout((1 << 30) + 1, 2, 32, PixmatEncoding_Unsigned),
+                                  packed_layout(1 << 30, 3, 16, PixmatEncoding_Signed)})
+        EXPECT_EQ(try_create(l, PixmatCreateMode_Layout, image), E_INVALIDARG) << l.width;
+}
+
 /// A descriptor of somebody else; the n-th property fails.
-class failing_descriptor final : public implements<IPixmatDescriptor> {
+class failing_descriptor final : public foreign_object<IPixmatDescriptor> {
 public:
     explicit failing_descriptor(int n) : left_(n) {}
     HRESULT get_Width(LONG* v) noexcept override { return give(4, v); }
@@ -68,17 +77,6 @@ public:
     HRESULT put_Offset(LONG) noexcept override { return E_FAIL; }
     HRESULT put_XStride(LONG) noexcept override { return E_FAIL; }
     HRESULT put_YStride(LONG) noexcept override { return E_FAIL; }
-    HRESULT GetTypeInfoCount(uint32_t*) noexcept override { return E_NOTIMPL; }
-    HRESULT GetTypeInfo(uint32_t, LCID, ITypeInfo**) noexcept override { return E_NOTIMPL; }
-    HRESULT GetIDsOfNames(const GUID&, OLECHAR**, uint32_t, LCID, DISPID*) noexcept override
-    {
-        return E_NOTIMPL;
-    }
-    HRESULT Invoke(DISPID, const GUID&, LCID, uint16_t, DISPPARAMS*, VARIANT*, EXCEPINFO*,
-                   uint32_t*) noexcept override
-    {
-        return E_NOTIMPL;
-    }
 
 private:
     template <class T>
