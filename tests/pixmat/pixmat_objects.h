@@ -4,6 +4,7 @@
 #include "com/implements.h"
 #include "pixmat/descriptor.h"
 #include "support/cases.h"
+#include "support/foreign_object.h"
 #include "zelt/com/class_registry.h"
 #include "zelt/pixmat/pixmat.h"
 
@@ -11,6 +12,8 @@
 #include <string>
 
 namespace Qor::Luxar::Test {
+
+using ZELT::Test::foreign_object;
 
 template <class I>
 com_ptr<I> create(const GUID& class_id)
@@ -65,7 +68,7 @@ inline com_ptr<IPixmatLock> open_write(IPixmat2* image)
 }
 
 /// A foreign rectangle whose getters can fail.
-class area_stub final : public implements<IRectangle> {
+class area_stub final : public foreign_object<IRectangle> {
 public:
     explicit area_stub(rectangle r, HRESULT answer = S_OK) : r_(r), answer_(answer) {}
 
@@ -77,17 +80,6 @@ public:
     HRESULT put_Top(LONG) noexcept override { return E_NOTIMPL; }
     HRESULT put_Right(LONG) noexcept override { return E_NOTIMPL; }
     HRESULT put_Bottom(LONG) noexcept override { return E_NOTIMPL; }
-    HRESULT GetTypeInfoCount(uint32_t*) noexcept override { return E_NOTIMPL; }
-    HRESULT GetTypeInfo(uint32_t, LCID, ITypeInfo**) noexcept override { return E_NOTIMPL; }
-    HRESULT GetIDsOfNames(const GUID&, OLECHAR**, uint32_t, LCID, DISPID*) noexcept override
-    {
-        return E_NOTIMPL;
-    }
-    HRESULT Invoke(DISPID, const GUID&, LCID, uint16_t, DISPPARAMS*, VARIANT*, EXCEPINFO*,
-                   uint32_t*) noexcept override
-    {
-        return E_NOTIMPL;
-    }
 
 private:
     HRESULT give(int32_t field, LONG* value) const noexcept

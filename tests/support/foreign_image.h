@@ -1,7 +1,7 @@
 // An image of somebody else: answers like ours, counts what is asked of it, and fails where a test tells it to.
 #pragma once
 
-#include "com/implements.h"
+#include "support/foreign_object.h"
 #include "zelt/pixmat/pixmat.h"
 
 #include <string>
@@ -12,7 +12,7 @@ namespace Qor::Luxar::ZELT::Test {
 /// Where a foreign image fails, with E_ACCESSDENIED.
 enum class failing { nothing, descriptor, descriptor_value, open_read, open_write, commit };
 
-class foreign_image : public implements<IPixmat2> {
+class foreign_image : public foreign_object<IPixmat2> {
 public:
     foreign_image(const image_layout& layout, void* data, failing where = failing::nothing)
         : layout_(layout), data_(static_cast<uint8_t*>(data)), where_(where)
@@ -36,18 +36,6 @@ public:
     HRESULT StartNotifications(IPixmatEvents*, PixmatEventMode) noexcept override { return E_NOTIMPL; }
     HRESULT StopNotifications(IPixmatEvents*) noexcept override { return E_NOTIMPL; }
 
-    HRESULT GetTypeInfoCount(uint32_t*) noexcept override { return E_NOTIMPL; }
-    HRESULT GetTypeInfo(uint32_t, LCID, ITypeInfo**) noexcept override { return E_NOTIMPL; }
-    HRESULT GetIDsOfNames(const GUID&, OLECHAR**, uint32_t, LCID, DISPID*) noexcept override
-    {
-        return E_NOTIMPL;
-    }
-    HRESULT Invoke(DISPID, const GUID&, LCID, uint16_t, DISPPARAMS*, VARIANT*, EXCEPINFO*,
-                   uint32_t*) noexcept override
-    {
-        return E_NOTIMPL;
-    }
-
 private:
     class lock final : public implements<IPixmatLock> {
     public:
@@ -65,7 +53,7 @@ private:
         std::string kind_;
     };
 
-    class descriptor final : public implements<IPixmatDescriptor> {
+    class descriptor final : public foreign_object<IPixmatDescriptor> {
     public:
         explicit descriptor(foreign_image& image) : image_(&image) {}
         HRESULT get_Width(LONG* v) noexcept override { return give(image_->layout_.width, v); }
@@ -89,17 +77,6 @@ private:
         HRESULT put_Offset(LONG) noexcept override { return E_NOTIMPL; }
         HRESULT put_XStride(LONG) noexcept override { return E_NOTIMPL; }
         HRESULT put_YStride(LONG) noexcept override { return E_NOTIMPL; }
-        HRESULT GetTypeInfoCount(uint32_t*) noexcept override { return E_NOTIMPL; }
-        HRESULT GetTypeInfo(uint32_t, LCID, ITypeInfo**) noexcept override { return E_NOTIMPL; }
-        HRESULT GetIDsOfNames(const GUID&, OLECHAR**, uint32_t, LCID, DISPID*) noexcept override
-        {
-            return E_NOTIMPL;
-        }
-        HRESULT Invoke(DISPID, const GUID&, LCID, uint16_t, DISPPARAMS*, VARIANT*, EXCEPINFO*,
-                       uint32_t*) noexcept override
-        {
-            return E_NOTIMPL;
-        }
 
     private:
         template <class T>
