@@ -102,9 +102,9 @@ struct IBasicOps2 : IDispatch {
     /// Pixels     both real, of any two types, or both RGB or both BGR of 24 bits, each byte on its own.
     /// Arguments  pIPos: where the origin of pIB falls in pIA, in pixels. fa, fb: weights of pIA and pIB.
     /// Values     fa * pIA + fb * (sum of the neighbours in pIB, each with its bilinear weight), in double:
-    ///            first the pixel itself, then its left neighbour, then the two above. What lies outside pIB adds nothing, so that its
-    ///            rim fades. Pixels of pIA that no neighbour of any weight touches stay as they are: at a whole
-    ///            position these are all but those below pIB.
+    ///            first the pixel itself, then its left neighbour, then the two above. What lies outside pIB adds
+    ///            nothing, so that its rim fades. Pixels of pIA that no neighbour of any weight touches stay as they
+    ///            are: at a whole position these are all but those below pIB.
     /// In place   always; pIB may be pIA.
     /// NaN        a position that is NaN, infinite or so far away that nothing meets changes nothing and succeeds.
     /// Fails      E_INVALIDARG for a null argument; E_NOTIMPL for other pixels.
