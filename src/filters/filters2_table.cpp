@@ -8,11 +8,14 @@ namespace {
 
 constexpr const char* ten_types =
     "Signed and unsigned integers of up to 32 bits, float, double, RGB and BGR by channel; integers are cut "
-    "towards zero "
-    "and stop at the limits of their storage. The output has the type of the image.";
+    "towards zero and stop at the limits of their storage. The output has the type of the image.";
+
+constexpr const char* ten_types_unlimited =
+    "Signed and unsigned integers of up to 32 bits, float, double, RGB and BGR by channel; integers are cut "
+    "towards zero. The output has the type of the image.";
 
 constexpr auto filters2_rows = std::tuple(
-    pixels(ten_types,
+    pixels(ten_types_unlimited,
            method<&IFilters2::Gauss>("Gauss", "smooth; the cost does not depend on sigma", in("pIImage"),
                                      in("sigma"), opt("pIOut"), result("ppIPixmat"))),
     method<&IFilters2::Median>("Median", "median of a window", in("pIImage"), in("kernelWidth"),
