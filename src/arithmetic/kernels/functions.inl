@@ -7,6 +7,7 @@
 
 #include "arithmetic/kernels/elementary.inl"
 #include "arithmetic/kernels/functions_table.h"
+#include "arithmetic/kernels/operators.inl"
 
 #include <sleef.h>
 
@@ -198,6 +199,13 @@ inline reals unusual_power(reals x, double exponent)
     return x == x ? of_number : x;
 }
 
+/// A single product or root: exactly rounded from double precision or at once, to the same bits.
+template <class Function>
+void map_singles(const uint8_t* from, uint8_t* to, int64_t count, Function f)
+{
+    arithmetic::each(count, f, contiguous_row<float>{to}, contiguous_row<float>{const_cast<uint8_t*>(from)});
+}
+
 /// The pixels themselves, squares and roots are exactly rounded. The root of -0 is 0, that of negative infinity infinite.
 template <class T>
 void map_power(const uint8_t* from, uint8_t* to, int64_t count, double exponent)
@@ -206,6 +214,13 @@ void map_power(const uint8_t* from, uint8_t* to, int64_t count, double exponent)
     if (exponent == 0 || !(exponent > -infinity && exponent < infinity))
         return map_all([=](reals x) { return unusual_power(x, exponent); });
     if (exponent == 1) return map_all([](reals x) { return x; });
+    if constexpr (sizeof(T) == sizeof(float)) {
+        if (exponent == 2) return map_singles(from, to, count, [](float x) { return x * x; });
+        if (exponent == 0.5)
+            return map_singles(from, to, count, [](float x) {
+                return __builtin_sqrtf(x == -__builtin_inff() ? -x : x + 0.0f);
+            });
+    }
     if (exponent == 2) return map_all([](reals x) { return x * x; });
     if (exponent == 0.5) return map_all([](reals x) { return root(x == -infinity ? -x : x + 0.0); });
     if constexpr (sizeof(T) == sizeof(double)) {
