@@ -151,24 +151,31 @@ void register_number(const std::string& type, int size, Arithmetic::number n, co
 {
     const lazy_frames f{size, frames_of<T>};
     const size_t pixels = pixels_of(size);
-    for (const auto& [what, m] : {std::pair{"Add", method::add}, {"Multiply", method::multiply}}) {
+    for (const auto& [what, m] :
+         {std::pair{"Add", method::add}, {"Multiply", method::multiply}, {"Divide", method::divide}}) {
         const std::string name = std::string(what) + "/" + type + "-" + kind + "/" + std::to_string(size);
         const auto work = [=, m = m] {
             Arithmetic::combine(m, wrap, image_of<T>(f->a), n, image_of<T>(f->dst));
         };
-        const bool adds = m == method::add;
+        const auto value = [n, m = m](double a) {
+            return m == method::add ? a + n.real : m == method::multiply ? a * n.real : a / n.real;
+        };
         zelt_bench::register_case(
             name,
             [=] {
                 work();
-                const double a = double(f->a.at<T>(1, 1));
-                return f->dst.at<T>(1, 1) == static_cast<T>(adds ? a + n.real : a * n.real);
+                for (int x = 0; x < size; ++x)
+                    if (f->dst.at<T>(1, x) != static_cast<T>(value(double(f->a.at<T>(1, x))))) return false;
+                return true;
             },
             work);
         zelt_bench::register_copy(name, pixels * sizeof(T));
-        zelt_bench::register_peer(name, adds ? "add" : "multiply", [=] {
-            adds ? cv::add(f->a, cv::Scalar(n.real), f->dst) : cv::multiply(f->a, n.real, f->dst);
-        });
+        if (m == method::add)
+            zelt_bench::register_peer(name, "add", [=] { cv::add(f->a, cv::Scalar(n.real), f->dst); });
+        else if (m == method::multiply)
+            zelt_bench::register_peer(name, "multiply", [=] { cv::multiply(f->a, n.real, f->dst); });
+        else
+            zelt_bench::register_peer(name, "divide", [=] { cv::divide(f->a, n.real, f->dst); });
     }
 }
 

@@ -184,6 +184,48 @@ TEST(Binary, NumbersFollowTheDefinition)
         }
 }
 
+TEST(Binary, EachQuotientOfANarrowPixelAndANumberIsExact)
+{
+    for (const storage t : {storage::u8, storage::u16, storage::i8, storage::i16}) {
+        real_image a(t, {256, 256}, memory_layout::packed);
+        if (Arithmetic::bytes_of(t) == 1)
+            a.set([](int x, int) { return static_cast<uint8_t>(x); });
+        else
+            a.set([](int x, int y) { return static_cast<uint16_t>(256 * y + x); });
+        for (const int64_t n :
+             {1, 2, 3, 7, 10, 127, 128, 255, 256, 257, 32767, 65535, -1, -3, -128, -32768}) {
+            const auto number = plain_value{storage::i32, n, 0};
+            const real_image dst(t, {256, 256}, memory_layout::packed);
+            if ((n < 0 && Arithmetic::is_unsigned(t)) || enough_failures()) continue;
+            step(name(t) + " by " + std::to_string(n), [&] {
+                for_each_level([&](level) {
+                    Arithmetic::combine(method::divide, saturate, a.view(), number_of(number), dst.view());
+                    dst.expect([&](int x, int y) {
+                        return by_definition(method::divide, true, a.at(x, y), number, t,
+                                             static_cast<int>(8 * Arithmetic::bytes_of(t)));
+                    });
+                });
+            });
+        }
+    }
+}
+
+TEST(Binary, OneLargeFloatLeavesItsNeighboursAlone)
+{
+    for (const storage t : {storage::u8, storage::u16, storage::i16}) {
+        real_image a(t, {1500, 1}, memory_layout::packed), b(storage::f32, {1500, 1}, memory_layout::packed);
+        a.fill(1);
+        b.set([](int x, int) { return x == 700 ? 5e9f : static_cast<float>(x - 400) / 3; });
+        a.replace_zeros();
+        for_each_method([&](method m, int rounding) {
+            for_each_level([&](level) {
+                check_images(m, rounding, a, b, real_image(t, {1500, 1}, memory_layout::packed));
+                check_images(m, rounding, b, a, real_image(t, {1500, 1}, memory_layout::packed));
+            });
+        });
+    }
+}
+
 TEST(Binary, NumbersLeaveTheRestOfALargerOutput)
 {
     real_image a(storage::u8, {5, 4}, memory_layout::packed), dst(storage::u8, {9, 6}, memory_layout::padded);

@@ -1,6 +1,7 @@
 // The table of arithmetic, filled once for each instruction-set level.
 #include "arithmetic/kernels/blocks.inl"
 #include "arithmetic/kernels/direct.inl"
+#include "arithmetic/kernels/mixed.inl"
 
 namespace Qor::Luxar::ZELT::ZELT_LEVEL {
 namespace arithmetic {
@@ -26,6 +27,7 @@ constexpr int index_of()
 }
 constexpr int index(computing c) { return static_cast<int>(c); }
 constexpr int index(operation o) { return static_cast<int>(o); }
+constexpr int index(mixed_form f) { return static_cast<int>(f); }
 constexpr int index(form f) { return static_cast<int>(f); }
 constexpr int wrap = static_cast<int>(rounding::wrap);
 constexpr int saturate = static_cast<int>(rounding::saturate);
@@ -70,6 +72,32 @@ constexpr void fill_direct(arithmetic_table& t, types<T...>)
             entry[saturate] = direct<Op, Form, rounding::saturate, P>;
     };
     (fill(T{}), ...);
+}
+
+/// Sums and products have the image of the output's type on the left.
+template <operation Op, mixed_form Form, class... T>
+constexpr void fill_mixed(arithmetic_table& t, types<T...>)
+{
+    const auto fill = [&]<class P>(P) {
+        auto& entry = t.mixed[index(Op)][index(Form)][index_of<P>()];
+        entry[wrap] = mixed<Op, Form, rounding::wrap, P>;
+        entry[saturate] = mixed<Op, Form, rounding::saturate, P>;
+    };
+    (fill(T{}), ...);
+}
+
+template <operation Op>
+constexpr void fill_mixed_forms(arithmetic_table& t)
+{
+    using narrow = types<uint8_t, uint16_t, int16_t>;
+    using with_number = types<uint8_t, uint16_t, int16_t, float>;
+    constexpr bool ordered = Op == operation::subtract || Op == operation::divide;
+    fill_mixed<Op, mixed_form::real_right>(t, narrow{});
+    fill_mixed<Op, mixed_form::number_right>(t, with_number{});
+    if constexpr (ordered) {
+        fill_mixed<Op, mixed_form::real_left>(t, narrow{});
+        fill_mixed<Op, mixed_form::number_left>(t, with_number{});
+    }
 }
 
 template <class Part>
@@ -124,6 +152,10 @@ constexpr arithmetic_table make_table()
     fill_forms.template operator()<operation::max>();
     fill_direct<operation::subtract, form::value_left>(t, real_types{});
     fill_direct<operation::divide, form::value_left>(t, real_types{});
+    fill_mixed_forms<operation::add>(t);
+    fill_mixed_forms<operation::subtract>(t);
+    fill_mixed_forms<operation::multiply>(t);
+    fill_mixed_forms<operation::divide>(t);
     fill_complex<float>(t);
     fill_complex<double>(t);
     return t;

@@ -54,12 +54,19 @@ using direct_function = void (*)(const uint8_t* a, const uint8_t* b, uint8_t* ds
 enum class form { images, value_right, value_left };
 inline constexpr int form_count = 3;
 
+/// The operands of a direct loop whose output has the type of one image: the other one is a Float 32 image or a
+/// number in double precision.
+enum class mixed_form { real_right, real_left, number_right, number_left };
+inline constexpr int mixed_form_count = 4;
+
 struct arithmetic_table {
     load_function load[computing_count][storage_count];
     load_function load_byte[2]; ///< Float 32 and 64, truncated to one byte, to u32
     apply_function apply[operation_count][computing_count];
     store_function store[computing_count][storage_count][rounding_count];
     direct_function direct[operation_count][form_count][storage_count][rounding_count];
+    direct_function mixed[operation_count][mixed_form_count][storage_count]
+                         [rounding_count]; ///< null: in blocks
 };
 
 } // namespace Qor::Luxar::ZELT::Arithmetic

@@ -80,18 +80,48 @@ struct alignas(64) block {
     uint8_t bytes[block_pixels * sizeof(double) * 2];
 };
 
-/// One operand of the block walk: pixels to load, or a block that stays.
+/// Pixels that lie as a block does: adjacent, aligned, of the computing type. For 32-bit integers its sign is no matter.
+bool is_like_block(const plane& p, computing c)
+{
+    const auto address = reinterpret_cast<uintptr_t>(p.first) | static_cast<uintptr_t>(p.y_stride);
+    if (!p.adjacent() || address % static_cast<uintptr_t>(bytes_of(p.type)) != 0) return false;
+    switch (c) {
+    case computing::u32:
+    case computing::i32: return p.type == storage::u32 || p.type == storage::i32;
+    case computing::f32: return p.type == storage::f32;
+    case computing::f64: return p.type == storage::f64;
+    default: return false;
+    }
+}
+
+/// One operand of the block walk: pixels to load, pixels to use where they lie, or a block that stays.
 struct source {
     plane pixels;
     load_function load = nullptr;
+    bool in_place = false;
 
-    void get(int64_t x, int64_t y, int32_t count, block& to) const
+    const void* get(int64_t x, int64_t y, int32_t count, block& to) const
     {
+        if (in_place) return pixels.at(x, y);
         if (load) load(pixels.at(x, y), pixels.x_stride, count, to.bytes);
+        return to.bytes;
     }
 };
 
-/// A null apply stores the second operand.
+source source_of(const plane& p, computing c, const arithmetic_table& table)
+{
+    return {p, table.load[index(c)][index(p.type)], is_like_block(p, c)};
+}
+
+/// How results become pixels of the output; null where they are pixels as they come.
+store_function store_of(const plane& out, computing c, apply_function apply, rounding mode,
+                        const arithmetic_table& table)
+{
+    if (apply && mode == rounding::wrap && is_like_block(out, c)) return nullptr;
+    return table.store[index(c)][index(out.type)][index(mode)];
+}
+
+/// A null apply stores the second operand. A null store: apply writes into the output itself.
 struct block_job {
     source a, b;
     apply_function apply;
@@ -109,11 +139,14 @@ void run_blocks(const block_job& job, block& first, block& second)
         for (int64_t x = 0; x < job.extent.width; x += block_pixels) {
             const auto count = static_cast<int32_t>(job.extent.width - x < block_pixels ? job.extent.width - x
                                                                                         : block_pixels);
-            job.a.get(x, y, count, first);
-            job.b.get(x, y, count, second);
-            if (job.apply) job.apply(first.bytes, second.bytes, count, result.bytes);
-            job.store(job.apply ? result.bytes : second.bytes, count, job.limits, job.dst.at(x, y),
-                      job.dst.x_stride);
+            const void* const a = job.a.get(x, y, count, first);
+            const void* value = job.b.get(x, y, count, second);
+            uint8_t* const to = job.dst.at(x, y);
+            if (job.apply) {
+                job.apply(a, value, count, job.store ? result.bytes : to);
+                value = result.bytes;
+            }
+            if (job.store) job.store(value, count, job.limits, to, job.dst.x_stride);
         }
 }
 
@@ -124,6 +157,18 @@ void run_direct(direct_function loop, plane a, plane b, const plane& dst, range 
     const int64_t rows = in_one_row ? 1 : extent.height;
     const int64_t count = in_one_row ? int64_t{extent.width} * extent.height : extent.width;
     for (int64_t y = 0; y < rows; ++y) loop(a.at(0, y), b.at(0, y), dst.at(0, y), count, limits);
+}
+
+/// The direct loop for an integer and a Float 32 image, if there is one. The output has the type of the integer one.
+direct_function mixed_loop(const arithmetic_table& table, operation op, rounding mode, const plane& a,
+                           const plane& b, const plane& dst)
+{
+    if (!a.adjacent() || !b.adjacent() || !dst.adjacent()) return nullptr;
+    if (dst.type == a.type && b.type == storage::f32)
+        return table.mixed[index(op)][index(mixed_form::real_right)][index(a.type)][index(mode)];
+    if (dst.type == b.type && a.type == storage::f32)
+        return table.mixed[index(op)][index(mixed_form::real_left)][index(b.type)][index(mode)];
+    return nullptr;
 }
 
 void copy_rows(const plane& src, const plane& dst, size extent, bool in_one_row)
@@ -256,10 +301,19 @@ outcome combine(method m, int32_t given_rounding, const image& a, const image& b
             run_direct(direct, first, second, out, limits, extent, in_one_row);
         return outcome::done;
     }
-    const auto load = [&](const plane& p) { return source{p, table.load[index(c)][index(p.type)]}; };
+    const bool commutes = chosen.op == operation::add || chosen.op == operation::multiply;
+    if (commutes && !chosen.assigns && is_float(first.type) && !is_float(to))
+        std::swap(first, second); // the form that is there
+    const direct_function mixed = mixed_loop(table, chosen.op, mode, first, second, out);
+    if (mixed && !chosen.assigns) {
+        const bool in_one_row =
+            is_packed(out, extent) && is_packed(first, extent) && is_packed(second, extent);
+        run_direct(mixed, first, second, out, limits, extent, in_one_row);
+        return outcome::done;
+    }
     block x, y;
-    run_blocks({chosen.assigns ? source{} : load(first), load(second), apply,
-                table.store[index(c)][index(to)][index(mode)], out, limits, extent},
+    run_blocks({chosen.assigns ? source{} : source_of(first, c, table), source_of(second, c, table), apply,
+                store_of(out, c, apply, mode, table), out, limits, extent},
                x, y);
     return outcome::done;
 }
@@ -370,6 +424,19 @@ outcome combine(method m, int32_t given_rounding, const image& a, const number& 
                    limits, extent, in_one_row);
         return outcome::done;
     }
+    if (!chosen.assigns && from == to && b.type == storage::f64 && image_pixels.adjacent() &&
+        out.adjacent()) {
+        const mixed_form f = chosen.reversed ? mixed_form::number_left : mixed_form::number_right;
+        const direct_function mixed = table.mixed[index(chosen.op)][index(f)][index(to)][index(mode)];
+        if (mixed) {
+            std::memcpy(value, &b.real, sizeof b.real);
+            const plane single{value, 0, 0, storage::f64};
+            const bool in_one_row = is_packed(out, extent) && is_packed(image_pixels, extent);
+            run_direct(mixed, chosen.reversed ? single : image_pixels,
+                       chosen.reversed ? image_pixels : single, out, limits, extent, in_one_row);
+            return outcome::done;
+        }
+    }
     block x, y;
     fill_block(b, c, chosen.reversed ? x : y);
     if (chosen.assigns && out.adjacent()) {
@@ -381,10 +448,9 @@ outcome combine(method m, int32_t given_rounding, const image& a, const number& 
             fill(out.at(0, i), in_one_row ? row * extent.height : row);
         return outcome::done;
     }
-    source pixels{image_pixels, table.load[index(c)][index(from)]};
-    if (chosen.assigns) pixels.load = nullptr;
+    const source pixels = chosen.assigns ? source{} : source_of(image_pixels, c, table);
     run_blocks({chosen.reversed ? source{} : pixels, chosen.reversed ? pixels : source{}, apply,
-                table.store[index(c)][index(to)][index(mode)], out, limits, extent},
+                store_of(out, c, apply, mode, table), out, limits, extent},
                x, y);
     return outcome::done;
 }

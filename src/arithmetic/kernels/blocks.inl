@@ -97,15 +97,15 @@ struct flag_of_width<double> {
     using type = int64_t;
 };
 
-/// True when every value, truncated, fits into 32 bits. NaN does not.
+/// True when every value, truncated, is a signed number of 32 bits above the least one. NaN is not.
 template <class W>
 bool fit_32_bits(const W* values, int32_t count)
 {
     typename flag_of_width<W>::type outside =
         0; // one comparison at a time: the compiler takes several values then
     for (int32_t i = 0; i < count; ++i) {
-        outside |= values[i] >= static_cast<W>(-0x1p31) ? 0 : 1;
-        outside |= values[i] < static_cast<W>(0x1p31) ? 0 : 1;
+        const W size = values[i] < 0 ? -values[i] : values[i];
+        outside |= size < static_cast<W>(0x1p31) ? 0 : 1;
     }
     return outside == 0;
 }
@@ -128,6 +128,13 @@ void truncate(const W* values, int32_t count, Row dst)
     else
         each(
             count, [](W v) { return low_bits<T>(v); }, dst, values);
+}
+
+/// The limits lie within 32 bits.
+template <class T, class W>
+T truncated_within(W v, bounds<W> limits)
+{
+    return static_cast<T>(static_cast<int32_t>(clamp(v, limits)));
 }
 
 template <class S>
@@ -207,7 +214,11 @@ void store(const void* from, int32_t count, range limits, uint8_t* to, int64_t s
                 imaginary[i] = in.imaginary[i];
             }
         } else if constexpr (is_real<W> && is_integer<T>) {
-            if constexpr (Mode == rounding::saturate) {
+            if constexpr (Mode == rounding::saturate && sizeof(T) < 4) {
+                const bounds<W> b(limits);
+                each(
+                    count, [=](W v) { return truncated_within<T>(v, b); }, dst, values);
+            } else if constexpr (Mode == rounding::saturate) {
                 alignas(64) W clamped[Arithmetic::block_pixels];
                 const bounds<W> b(limits);
                 each(
