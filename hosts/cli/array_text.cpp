@@ -16,20 +16,29 @@ namespace {
 
 using rows_of_words = std::vector<std::vector<std::string>>;
 
-/// Numbers stand between commas and blanks; a '#' that starts a line makes it a comment.
+/// Numbers stand between commas or blanks. Nothing between two commas is a word, and no number: a gap in a table must not
+/// move what follows.
+std::vector<std::string> words_of(const std::string& line)
+{
+    std::vector<std::string> words;
+    for (const std::string& part : split(line, ',')) {
+        std::istringstream blanks(part);
+        const size_t before = words.size();
+        for (std::string word; blanks >> word;) words.push_back(word);
+        if (words.size() == before) words.emplace_back();
+    }
+    return words;
+}
+
+/// A '#' that starts a line makes it a comment.
 rows_of_words rows_of_file(const std::string& path)
 {
     std::ifstream file(path);
     if (!file) throw failure(path + ": " + std::strerror(errno));
     rows_of_words rows;
-    for (std::string line; std::getline(file, line);) {
-        if (line.starts_with('#')) continue;
-        std::ranges::replace(line, ',', ' ');
-        std::istringstream words(line);
-        std::vector<std::string> row;
-        for (std::string word; words >> word;) row.push_back(word);
-        if (!row.empty()) rows.push_back(std::move(row));
-    }
+    for (std::string line; std::getline(file, line);)
+        if (!line.starts_with('#') && line.find_first_not_of(" \t\r") != line.npos)
+            rows.push_back(words_of(line));
     if (file.bad()) throw failure(path + ": cannot be read");
     return rows;
 }
@@ -37,13 +46,7 @@ rows_of_words rows_of_file(const std::string& path)
 rows_of_words rows_of_text(const std::string& text)
 {
     rows_of_words rows;
-    for (const std::string& row : split(text, ';')) {
-        rows.emplace_back();
-        for (std::string word : split(row, ',')) {
-            std::erase(word, ' ');
-            rows.back().push_back(word);
-        }
-    }
+    for (const std::string& row : split(text, ';')) rows.push_back(words_of(row));
     return rows;
 }
 

@@ -151,6 +151,8 @@ def test_what_was_not_understood_is_a_usage_error(zelt, images):
         ("Statistics.Mean", "a.tif", "-o", "x.tif"): "makes no image",
         ("Basic.Add", "a.tif", "300:VT_UI1", "-o", "x.tif"): "'300:VT_UI1' does not fit its type",
         ("Basic.Add", "a.tif", "[1,2;3]", "-o", "x.tif"): "has rows of different length",
+        ("Basic.Add", "a.tif", "[1 2; 3, 4 5]", "-o", "x.tif"): "has rows of different length",
+        ("Basic.Add", "a.tif", "[1,,2]", "-o", "x.tif"): "'' is not a number",
         ("Basic.Add", "new:7x5", "1", "-o", "x.tif"): "is not WIDTHxHEIGHT:ENCODING:BITS",
         ("Basic.Add", "new:7x5:Grey:8", "1", "-o", "x.tif"): "has no encoding 'Grey'",
         ("Basic.Add", "a.tif", "1", "-o", "x.tif", "--rounding", "up"): "'up' is none of",
