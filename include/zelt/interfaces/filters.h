@@ -38,12 +38,12 @@ struct IFilters2 : IDispatch {
     /// backward over rows and then over columns.
     /// Arguments  sigma: in pixels. Below 0.5 a 3 x 3 kernel of the Gaussian's values is convolved instead;
     ///            sigma 0 makes NaN of its weights.
-    /// Values     integers: cut and not limited from 0.5 on, so a constant 100 can become 99; saturated below
-    ///            0.5.
+    /// Values     integers: cut and not limited from 0.5 on, so a constant 100 can become 99, and the
+    ///            brightest values of Unsigned 32 wrap to 0; saturated below 0.5.
     /// Border     from 0.5 on the image continues with its first and last value in each direction; clamped
     ///            below.
     /// In place   allowed.
-    /// NaN        spoils its row and column, and what is beside them.
+    /// NaN        spoils the whole image, from row to column; below 0.5 the 3 x 3 pixels around it.
     /// Threads    below 0.5 on the facet's pool, and Cancel stops it as it does Convolve.
     /// Fails      "Gauss: src and dst pixel types must be identical"; "Gauss: unsupported pixel type";
     ///            "ZELT GaussDerivative input and output images must have the same size".
@@ -143,7 +143,7 @@ struct IFilters2 : IDispatch {
     /// Values     smoothed into float (double for double); the hypotenuse is single precision; saturated.
     /// Border     clamped.
     /// In place   allowed.
-    /// NaN        spoils its row and column, and what is beside them.
+    /// NaN        spoils the whole image, from row to column.
     /// Fails      "GaussDerivative: src and dst pixel types must be identical";
     ///            "GaussDerivative: unsupported pixel type";
     ///            "ZELT GaussDerivative input and output images must have the same size".
