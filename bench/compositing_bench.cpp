@@ -1,6 +1,7 @@
 // Offsets, comparison, frames and blending, beside what a user of OpenCV would write for the same pictures. OpenCV
 // rounds where zelt truncates and blends 8 bits in several rounded steps, so peers do the nearest work.
 #include "support/bench.h"
+#include "support/views.h"
 
 #include "arithmetic/kernels/blend.h"
 #include "arithmetic/kernels/equals.h"
@@ -20,6 +21,7 @@ using namespace Qor::Luxar;
 using namespace Qor::Luxar::ZELT;
 using Arithmetic::image;
 using Arithmetic::outcome;
+using zelt_bench::case_name;
 using zelt_bench::register_case;
 using zelt_bench::register_copy;
 using zelt_bench::register_peer;
@@ -83,15 +85,10 @@ bool is_at(const cv::Mat& m, int x, int y, double value)
     return m.at<T>(y, x) == static_cast<T>(value);
 }
 
-std::string name_of(const char* operation, const char* type, int size)
-{
-    return std::string(operation) + "/" + type + "/" + std::to_string(size);
-}
-
 template <class T>
 void register_equals(const char* type, int size)
 {
-    const std::string name = name_of("Equals", type, size);
+    const std::string name = case_name("Equals", type, size);
     const auto get = [=]() -> pictures& {
         pictures& p = pictures_of<T>(size);
         if (p.twin.empty()) p.twin = p.a.clone();
@@ -125,7 +122,7 @@ cv::Mat disc(int size)
 template <class T>
 void register_combine(const char* type, int size, bool by_disc)
 {
-    const std::string name = name_of(by_disc ? "Combine-by-disc" : "Combine", type, size);
+    const std::string name = case_name(by_disc ? "Combine-by-disc" : "Combine", type, size);
     const double full = std::is_floating_point_v<T> ? 1.0 : std::pow(2.0, 8 * sizeof(T)) - 1;
     const auto mask = [=]() -> cv::Mat& {
         static std::map<int, cv::Mat> discs;
@@ -159,7 +156,7 @@ void register_combine(const char* type, int size, bool by_disc)
 template <class T>
 void register_padding(const char* type, int size)
 {
-    const std::string margins = name_of("Margins", type, size), extend = name_of("Extend", type, size);
+    const std::string margins = case_name("Margins", type, size), extend = case_name("Extend", type, size);
     const auto frame = [=] {
         pictures& p = pictures_of<T>(size);
         Arithmetic::set_margins(image_of(p.a), 10, image_of(p.dst));
@@ -196,7 +193,7 @@ void register_padding(const char* type, int size)
         pictures& p = pictures_of<T>(size);
         cv::copyMakeBorder(p.a, p.wide, 32, 32, 32, 32, cv::BORDER_CONSTANT, cv::Scalar(7));
     });
-    const std::string fill = name_of("SetTo", type, size);
+    const std::string fill = case_name("SetTo", type, size);
     const auto set = [=] {
         const image dst = image_of(pictures_of<T>(size).dst);
         Arithmetic::combine(Arithmetic::method::assign, 1, dst, {Arithmetic::storage::f64, 7, 0}, dst);
@@ -215,7 +212,7 @@ void register_padding(const char* type, int size)
 template <class T>
 void register_whole_offset(const char* type, int size, double fa, double fb, const char* what)
 {
-    const std::string name = name_of(what, type, size);
+    const std::string name = case_name(what, type, size);
     const auto work = [=] {
         pictures& p = pictures_of<T>(size);
         Arithmetic::add_integer_offset(image_of(p.a), image_of(p.b), {20, -30}, fa, fb, image_of(p.dst));
@@ -241,7 +238,7 @@ void register_whole_offset(const char* type, int size, double fa, double fb, con
 template <class T>
 void register_offset(const char* type, int size)
 {
-    const std::string name = name_of("AddOffset", type, size);
+    const std::string name = case_name("AddOffset", type, size);
     const auto work = [=] {
         pictures& p = pictures_of<T>(size);
         Arithmetic::add_offset(image_of(p.dst), image_of(p.b), {20.25, -30.5}, 0.5, 0.5);
@@ -270,7 +267,7 @@ void register_offset(const char* type, int size)
 template <class T>
 void register_modulate(const char* mask_type, int size)
 {
-    const std::string name = name_of("Modulate", (std::string("rgb-by-") + mask_type).c_str(), size);
+    const std::string name = case_name("Modulate", std::string("rgb-by-") + mask_type, size);
     const auto colours = [=]() -> cv::Mat& {
         static std::map<int, cv::Mat> made;
         cv::Mat& m = made[size];

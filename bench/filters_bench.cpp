@@ -17,17 +17,7 @@ namespace {
 
 using namespace Qor::Luxar;
 using namespace Qor::Luxar::ZELT;
-using zelt_bench::difference_from;
-using zelt_bench::frames_of;
-using zelt_bench::view_of;
-
-constexpr int size_of_frames = 2000;
-constexpr auto pixels = static_cast<size_t>(size_of_frames) * size_of_frames;
-
-std::string case_name(const std::string& operation, const char* type)
-{
-    return operation + "/" + type + "/" + std::to_string(size_of_frames);
-}
+using namespace zelt_bench;
 
 /// Positive weights with a sum of 1, none like the other.
 std::vector<double> weights(int length)
@@ -43,10 +33,10 @@ template <class T>
 void register_convolve(int length)
 {
     const std::string operation = "Convolve-" + std::to_string(length) + "x" + std::to_string(length);
-    const std::string name = case_name(operation, zelt_bench::name_of_type<T>());
+    const std::string name = frame_case<T>(operation);
     const auto kernel = std::make_shared<std::vector<double>>(weights(length));
     const auto work_on = [=](Thread::ThreadPool* pool) {
-        auto& f = frames_of<T>(size_of_frames);
+        auto& f = frames_of<T>();
         Filters::convolve(view_of<T>(f.src), {kernel->data(), length, length}, {length / 2, length / 2},
                           view_of<T>(f.dst), pool);
     };
@@ -54,23 +44,21 @@ void register_convolve(int length)
     cv::Mat flipped;
     cv::flip(cv::Mat(length, length, CV_64F, kernel->data()), flipped, -1);
     const auto peer = [=] {
-        auto& f = frames_of<T>(size_of_frames);
+        auto& f = frames_of<T>();
         cv::filter2D(f.src, f.dst, -1, flipped, cv::Point(-1, -1), 0, cv::BORDER_REPLICATE);
     };
     // Cut toward zero here, rounded there.
-    const auto check = [=] {
-        return difference_from(frames_of<T>(size_of_frames), 0, work, peer).largest <= 1;
-    };
-    zelt_bench::register_case(name, check, work);
-    zelt_bench::register_copy(name, pixels * sizeof(T));
-    zelt_bench::register_peer(name, "filter2D", peer);
+    const auto check = [=] { return difference_from<T>(work, peer).largest <= 1; };
+    register_case(name, check, work);
+    register_copy(name, pixels_of_frames * sizeof(T));
+    register_peer(name, "filter2D", peer);
 
     if (length != 7) return;
     constexpr int workers = 2;
     const auto pool = std::make_shared<Thread::MultiThreadedPool>(workers);
     const std::string threaded = name + "-on-" + std::to_string(workers);
-    zelt_bench::register_threaded(threaded, workers, check, [=] { work_on(pool.get()); });
-    zelt_bench::register_threaded(
+    register_threaded(threaded, workers, check, [=] { work_on(pool.get()); });
+    register_threaded(
         threaded + "/peer:filter2D", workers, [] { return true; }, peer);
 }
 
@@ -112,9 +100,9 @@ const gradient_case gradient_cases[] = {
 template <class T>
 void register_gradient(const gradient_case& g)
 {
-    const std::string name = case_name(g.name, zelt_bench::name_of_type<T>());
+    const std::string name = frame_case<T>(g.name);
     const auto work = [g] {
-        auto& f = frames_of<T>(size_of_frames);
+        auto& f = frames_of<T>();
         g.ours(view_of<T>(f.src), view_of<T>(f.dst));
     };
     struct floats {
@@ -122,18 +110,17 @@ void register_gradient(const gradient_case& g)
     };
     const auto own = std::make_shared<floats>();
     const auto peer = [=] {
-        g.gradients(frames_of<T>(size_of_frames).src, own->x, own->y);
+        g.gradients(frames_of<T>().src, own->x, own->y);
         cv::magnitude(own->x, own->y, own->magnitude);
     };
     const auto converted = [=] {
         peer();
-        own->magnitude.convertTo(frames_of<T>(size_of_frames).dst, cv::DataType<T>::depth);
+        own->magnitude.convertTo(frames_of<T>().dst, cv::DataType<T>::depth);
     };
-    zelt_bench::register_case(
-        name, [=] { return difference_from(frames_of<T>(size_of_frames), 0, work, converted).largest <= 1; },
-        work);
-    zelt_bench::register_copy(name, pixels * sizeof(T));
-    zelt_bench::register_peer(name, g.peer_name, peer);
+    register_case(
+        name, [=] { return difference_from<T>(work, converted).largest <= 1; }, work);
+    register_copy(name, pixels_of_frames * sizeof(T));
+    register_peer(name, g.peer_name, peer);
 }
 
 template <class T>

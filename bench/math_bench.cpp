@@ -1,6 +1,7 @@
 // Functions of single pixels, beside OpenCV where it has the function (its phase is an angle within a third of a degree,
 // its polarToCart gives sine and cosine at once), and beside a loop over the standard library's function.
 #include "support/bench.h"
+#include "support/views.h"
 
 #include "arithmetic/kernels/functions.h"
 
@@ -20,17 +21,7 @@ using Arithmetic::angle_function;
 using zelt_bench::register_case;
 using zelt_bench::register_copy;
 using zelt_bench::register_peer;
-
-template <class T>
-constexpr pixel_type type_of = std::is_same_v<T, float>    ? pixel_type::float_32
-                               : std::is_same_v<T, double> ? pixel_type::float_64
-                                                           : pixel_type::unsigned_16;
-
-template <class T>
-memory_2d view(const cv::Mat& m)
-{
-    return {type_of<T>, m.cols, m.rows, 0, sizeof(T), static_cast<int64_t>(m.step), m.data};
-}
+using zelt_bench::view_of;
 
 struct interval {
     double low, high;
@@ -77,7 +68,7 @@ template <class T, class R, class Work, class Nearest>
 void register_function(const std::string& name, int size, interval in, Work run, const one& exact,
                        Nearest nearest)
 {
-    const auto work = [=] { run(view<T>(frame_of<T>(size, in, 1)), view<R>(output_of<R>(size))); };
+    const auto work = [=] { run(view_of<T>(frame_of<T>(size, in, 1)), view_of<R>(output_of<R>(size))); };
     register_case(
         name,
         [=] {
@@ -100,15 +91,9 @@ void register_function(const std::string& name, int size, interval in, Work run,
 }
 
 template <class T>
-std::string type_name()
-{
-    return std::is_same_v<T, float> ? "f32" : std::is_same_v<T, double> ? "f64" : "u16";
-}
-
-template <class T>
 std::string name_of(const char* function, int size)
 {
-    return std::string(function) + "/" + type_name<T>() + "/" + std::to_string(size);
+    return zelt_bench::case_name(function, zelt_bench::name_of_type<T>(), size);
 }
 
 /// Exp, Log and Power keep the type.
@@ -183,8 +168,8 @@ void register_arc_tangent_2(int size)
     const std::string name = name_of<T>("Atan2", size);
     const interval in = std::is_integral_v<T> ? interval{0, 4096} : interval{-10, 10};
     const auto work = [=] {
-        Arithmetic::arc_tangent_2(view<T>(frame_of<T>(size, in, 1)), view<T>(frame_of<T>(size, in, 2)),
-                                  view<float>(output_of<float>(size)));
+        Arithmetic::arc_tangent_2(view_of<T>(frame_of<T>(size, in, 1)), view_of<T>(frame_of<T>(size, in, 2)),
+                                  view_of<float>(output_of<float>(size)));
     };
     const auto pixels = static_cast<size_t>(size) * static_cast<size_t>(size);
     const auto exact = [=](size_t i) {

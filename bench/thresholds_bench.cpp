@@ -1,6 +1,7 @@
 // Thresholds, normalisation and absolute values, beside OpenCV's nearest recipes on one thread. Its two-step
 // threshold limits instead of replacing, its automatic limit is Otsu's, and its stretch ends in another rounding.
 #include "support/bench.h"
+#include "support/views.h"
 
 #include "arithmetic/arithmetic.h"
 #include "arithmetic/kernels/thresholds.h"
@@ -18,19 +19,8 @@ namespace {
 using namespace Qor;
 using namespace Qor::Luxar;
 using namespace Qor::Luxar::ZELT;
-
-template <class T>
-constexpr pixel_type type_of()
-{
-    if constexpr (std::is_same_v<T, float>) return pixel_type::float_32;
-    return static_cast<pixel_type>((std::is_signed_v<T> ? 4 : 0) + static_cast<int>(sizeof(T) / 2));
-}
-
-template <class T>
-memory_2d view(const cv::Mat& m)
-{
-    return {type_of<T>(), m.cols, m.rows, 0, sizeof(T), static_cast<int64_t>(m.step), m.data};
-}
+using zelt_bench::case_name;
+using zelt_bench::view_of;
 
 struct frames {
     cv::Mat src, dst;
@@ -60,22 +50,17 @@ frames& frames_of(int size)
     return f;
 }
 
-std::string name_of(const char* operation, const char* type, int size)
-{
-    return std::string(operation) + "/" + type + "/" + std::to_string(size);
-}
-
 template <class T>
 void register_threshold(const char* type, int size)
 {
-    const std::string name = name_of("Threshold", type, size);
+    const std::string name = case_name("Threshold", type, size);
     const double top = std::is_same_v<T, float> ? 1 : sizeof(T) == 1 ? 255 : 4095;
     const double shift = std::is_signed_v<T> ? top / 2 : 0;
     const auto low = static_cast<T>(top * 0.4 - shift), high = static_cast<T>(top * 0.6 - shift);
     const Arithmetic::threshold_limits limits{double(low), double(low), double(high), double(high)};
     const auto work = [=] {
         frames& f = frames_of<T>(size);
-        Arithmetic::threshold(view<T>(f.src), limits, view<T>(f.dst));
+        Arithmetic::threshold(view_of<T>(f.src), limits, view_of<T>(f.dst));
     };
     const auto peer = [=] {
         frames& f = frames_of<T>(size);
@@ -98,10 +83,10 @@ void register_threshold(const char* type, int size)
 template <class T>
 void register_absolute(const char* type, int size)
 {
-    const std::string name = name_of("Abs", type, size);
+    const std::string name = case_name("Abs", type, size);
     const auto work = [=] {
         frames& f = frames_of<T>(size);
-        Arithmetic::absolute(view<T>(f.src), view<T>(f.dst));
+        Arithmetic::absolute(view_of<T>(f.src), view_of<T>(f.dst));
     };
     const auto peer = [=] {
         frames& f = frames_of<T>(size);
@@ -123,11 +108,11 @@ void register_absolute(const char* type, int size)
 template <class T>
 void register_auto_threshold(const char* type, int size)
 {
-    const std::string name = name_of("AutoThreshold", type, size);
+    const std::string name = case_name("AutoThreshold", type, size);
     const auto work = [=] {
         frames& f = frames_of<T>(size);
-        const double limit = Arithmetic::find_threshold(view<T>(f.src));
-        Arithmetic::threshold(view<T>(f.src), {limit, 0, limit, 1}, view<T>(f.dst));
+        const double limit = Arithmetic::find_threshold(view_of<T>(f.src));
+        Arithmetic::threshold(view_of<T>(f.src), {limit, 0, limit, 1}, view_of<T>(f.dst));
     };
     zelt_bench::register_case(
         name,
@@ -183,10 +168,10 @@ void stretch_by_opencv(frames& f, double low, double high)
 template <class T>
 void register_normalize(const char* type, int size, double low, double high)
 {
-    const std::string name = name_of(low > 0 ? "Normalize-1%" : "Normalize", type, size);
+    const std::string name = case_name(low > 0 ? "Normalize-1%" : "Normalize", type, size);
     const auto work = [=] {
         frames& f = frames_of<T>(size);
-        Arithmetic::normalize(view<T>(f.src), low, high, view<T>(f.dst));
+        Arithmetic::normalize(view_of<T>(f.src), low, high, view_of<T>(f.dst));
     };
     zelt_bench::register_case(
         name,

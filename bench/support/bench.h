@@ -21,20 +21,26 @@ struct opencv_threads {
     opencv_threads& operator=(const opencv_threads&) = delete;
 };
 
+/// The work of a case, if its result is right.
+template <class Check, class Work>
+void run_case(benchmark::State& state, Check check, Work work)
+{
+    if (!check()) {
+        state.SkipWithError("wrong result");
+        return;
+    }
+    for (auto _ : state) {
+        work();
+        benchmark::ClobberMemory();
+    }
+}
+
 /// Registers a case. It runs `check` once before it is timed: a wrong result is reported and never timed.
 template <class Check, class Work>
 void register_case(const std::string& name, Check check, Work work)
 {
-    benchmark::RegisterBenchmark(name.c_str(), [=](benchmark::State& state) {
-        if (!check()) {
-            state.SkipWithError("wrong result");
-            return;
-        }
-        for (auto _ : state) {
-            work();
-            benchmark::ClobberMemory();
-        }
-    });
+    benchmark::RegisterBenchmark(name.c_str(),
+                                 [=](benchmark::State& state) { run_case(state, check, work); });
 }
 
 /// Registers the peer of a case, named for instance "Median/u8/2048", "medianBlur".
@@ -52,14 +58,7 @@ void register_threaded(const std::string& name, int threads, Check check, Work w
 {
     benchmark::RegisterBenchmark(name.c_str(), [=](benchmark::State& state) {
         const opencv_threads allowed(threads);
-        if (!check()) {
-            state.SkipWithError("wrong result");
-            return;
-        }
-        for (auto _ : state) {
-            work();
-            benchmark::ClobberMemory();
-        }
+        run_case(state, check, work);
     })->UseRealTime();
 }
 

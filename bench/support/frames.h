@@ -1,40 +1,20 @@
-// Frames for benchmarks of filters: OpenCV owns their memory, the library's kernels see views of it.
+// Frames for benchmarks of filters, of one size.
 #pragma once
 
-#include "pixel/memory_2d.h"
-
-#include <opencv2/core.hpp>
+#include "views.h"
 
 #include <cmath>
 #include <cstdint>
-#include <map>
-#include <string>
-#include <type_traits>
 
 namespace zelt_bench {
 
-template <class T>
-constexpr Qor::Luxar::ZELT::pixel_type type_of()
-{
-    using Qor::Luxar::ZELT::pixel_type;
-    if constexpr (std::is_same_v<T, float>)
-        return pixel_type::float_32;
-    else if constexpr (std::is_same_v<T, double>)
-        return pixel_type::float_64;
-    else
-        return static_cast<pixel_type>((std::is_signed_v<T> ? 4 : 0) + static_cast<int>(sizeof(T) / 2));
-}
+inline constexpr int size_of_frames = 2000;
+inline constexpr auto pixels_of_frames = static_cast<std::size_t>(size_of_frames) * size_of_frames;
 
 template <class T>
-Qor::Luxar::ZELT::memory_2d view_of(const cv::Mat& m)
+std::string frame_case(const std::string& operation)
 {
-    return {type_of<T>(), m.cols, m.rows, 0, sizeof(T), static_cast<int64_t>(m.step), m.data};
-}
-
-template <class T>
-const char* name_of_type()
-{
-    return std::is_same_v<T, float> ? "f32" : sizeof(T) == 1 ? "u8" : "u16";
+    return case_name(operation, name_of_type<T>(), size_of_frames);
 }
 
 struct frame_pair {
@@ -44,10 +24,10 @@ struct frame_pair {
 /// A source with soft shapes, edges and camera noise, over 8 or 12 bits, or floats of the range of 8 bits, and an
 /// output that is used again and again. Made at first use.
 template <class T>
-frame_pair& frames_of(int size)
+frame_pair& frames_of()
 {
-    static std::map<int, frame_pair> sets;
-    frame_pair& f = sets[size];
+    constexpr int size = size_of_frames;
+    static frame_pair f;
     if (!f.src.empty()) return f;
     f = {cv::Mat(size, size, cv::DataType<T>::depth), cv::Mat(size, size, cv::DataType<T>::depth)};
     const double top = sizeof(T) == 2 ? 4095 : 255;
@@ -66,19 +46,19 @@ frame_pair& frames_of(int size)
     return f;
 }
 
-/// Mean and largest difference between our output and the peer's, away from the border.
+/// Mean and largest difference between our output and the peer's.
 struct difference {
     double mean, largest;
 };
-template <class Work, class Peer>
-difference difference_from(frame_pair& f, int border, Work work, Peer peer)
+template <class T, class Work, class Peer>
+difference difference_from(Work work, Peer peer)
 {
+    frame_pair& f = frames_of<T>();
     work();
     const cv::Mat ours = f.dst.clone();
     peer();
-    const cv::Rect inside(border, border, f.src.cols - 2 * border, f.src.rows - 2 * border);
     cv::Mat apart;
-    cv::absdiff(ours(inside), f.dst(inside), apart);
+    cv::absdiff(ours, f.dst, apart);
     return {cv::mean(apart)[0], cv::norm(apart, cv::NORM_INF)};
 }
 
