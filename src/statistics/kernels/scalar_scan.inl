@@ -349,6 +349,11 @@ void scan(const sample_grid& grid, scan_result& result)
     const bool packed = side_by_side && g.step == 1 && g.y_stride == columns * stride;
     constexpr int gathered = 1024;
     T buffer[gathered];
+    const auto adjoining = [&](const uint8_t* p, int n) {
+        if (side_by_side) return p;
+        gather<T>(p, stride, n, g.pixel_bytes, buffer);
+        return reinterpret_cast<const uint8_t*>(buffer);
+    };
     const int length = side_by_side ? block_length<T> : gathered;
 
     scanner<T> scanner{};
@@ -363,23 +368,13 @@ void scan(const sample_grid& grid, scan_result& result)
             const int64_t left = (static_cast<int64_t>(g.height) - y + g.step - 1) / g.step;
             const int rows = left < most_rows ? static_cast<int>(left) : most_rows;
             const auto n = static_cast<int>(columns);
-            const uint8_t* p = row;
-            if (!side_by_side) {
-                gather<T>(p, stride, n, g.pixel_bytes, buffer);
-                p = reinterpret_cast<const uint8_t*>(buffer);
-            }
-            scanner.add_whole_rows_of({p, n, rows, 0, y, g.step});
+            scanner.add_whole_rows_of({adjoining(row, n), n, rows, 0, y, g.step});
             y += int64_t{rows} * g.step;
             continue;
         }
         for (int64_t start = 0; start < columns; start += length) {
             const auto n = static_cast<int>(columns - start < length ? columns - start : length);
-            const uint8_t* p = row + start * stride;
-            if (!side_by_side) {
-                gather<T>(p, stride, n, g.pixel_bytes, buffer);
-                p = reinterpret_cast<const uint8_t*>(buffer);
-            }
-            scanner.add_part_of_row({p, n, 1, start * g.step, y, g.step});
+            scanner.add_part_of_row({adjoining(row + start * stride, n), n, 1, start * g.step, y, g.step});
         }
         scanner.end_row(y);
         y += g.step;
