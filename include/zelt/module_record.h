@@ -18,6 +18,7 @@
 
 #include "zelt/com/types.h"
 
+#include <algorithm>
 #include <cstdlib>
 #include <string>
 #include <string_view>

@@ -6,7 +6,7 @@
 namespace Qor::Luxar::Convert {
 
 /// To integers: rounded half away from zero, limited to the range, NaN is 0. To floats: the value. To full complex:
-/// imaginary part 0. To colour: a grey limited to 8 bits, alpha 255. Null for other types.
+/// an imaginary part of zero. To colour: a grey limited to 8 bits, alpha 255. Null for other types.
 store_pixels store_value(pixel_type type, working kind) noexcept;
 /// To integers: truncated, low 64 bits, then low bits; NaN and what no 64-bit integer holds are 0. No colour.
 store_pixels store_cast(pixel_type type, working kind) noexcept;

@@ -137,8 +137,8 @@ struct IPixmatConverter : IUnknown {
     /// Carries values over. To integers: rounded half away from zero, limited to the target's nominal range (12
     /// bits: 4095), NaN is 0. To float: the value itself, unscaled. Grey to colour repeats the grey limited to 8
     /// bits, alpha 255; colour to grey is 0.299 R + 0.587 G + 0.114 B, rounded (to float: not rounded); colour to
-    /// colour reorders, keeps alpha between four-byte layouts, else alpha is 255. Real to complex sets the
-    /// imaginary part 0; complex to real takes the real part; complex and half-complex to the same kind in the
+    /// colour reorders, keeps alpha between four-byte layouts, else alpha is 255. Real to complex makes the
+    /// imaginary part zero; complex to real takes the real part; complex and half-complex to the same kind in the
     /// other precision is element-wise. Anything else is E_NOTIMPL.
     virtual HRESULT ConvertRecode(const image_layout& source_layout, const void* source,
                                   const image_layout& target_layout, void* target,

@@ -136,7 +136,7 @@ void read_block(const gauss_plane& from, int64_t left, int64_t columns, int64_t 
             const strided_row<T> row{pixels, from.x_stride};
             for (int64_t x = 0; x < columns; ++x) to[x] = static_cast<N>(static_cast<T>(row[x]));
         } else if (columns == block) {
-            filters::convert_run<T>(pixels, block, to);
+            filters::convert_run<T>(pixels, block, to); // of a length that compilers know
         } else {
             filters::convert_run<T>(pixels, columns, to);
         }
@@ -259,9 +259,11 @@ void up_as(const gauss_job& job)
             for (int64_t r = 0; r < rows; ++r) {
                 uint8_t* const to = job.dst.first + (top + r) * job.dst.y_stride + left * job.dst.x_stride;
                 if (columns == block && job.dst.x_stride == sizeof(typename Store::pixel)) {
+                    // Of a length and a stride that compilers know.
                     store<Store>(results + r * block, block, to, sizeof(typename Store::pixel));
-                } else
+                } else {
                     store<Store>(results + r * block, columns, to, job.dst.x_stride);
+                }
             }
         }
     }
