@@ -46,19 +46,20 @@ frame_pair& frames_of()
     return f;
 }
 
-/// Mean and largest difference between our output and the peer's.
+/// Mean and largest difference between our output and the peer's, at least `border` pixels from the edges.
 struct difference {
     double mean, largest;
 };
 template <class T, class Work, class Peer>
-difference difference_from(Work work, Peer peer)
+difference difference_from(Work work, Peer peer, int border = 0)
 {
     frame_pair& f = frames_of<T>();
+    const cv::Rect inside(border, border, size_of_frames - 2 * border, size_of_frames - 2 * border);
     work();
-    const cv::Mat ours = f.dst.clone();
+    const cv::Mat ours = f.dst(inside).clone();
     peer();
     cv::Mat apart;
-    cv::absdiff(ours, f.dst, apart);
+    cv::absdiff(ours, f.dst(inside), apart);
     return {cv::mean(apart)[0], cv::norm(apart, cv::NORM_INF)};
 }
 
