@@ -1,5 +1,6 @@
 #include "arithmetic_cases.h"
 
+#include <cmath>
 #include <csignal>
 
 namespace Qor::Luxar::ZELT::Test {
@@ -184,29 +185,51 @@ TEST(Binary, NumbersFollowTheDefinition)
         }
 }
 
-TEST(Binary, EachQuotientOfANarrowPixelAndANumberIsExact)
+/// Numbers whose results with narrow pixels are hard to get: whole, close to whole, exact and inexact fractions, and
+/// those whose products with some pixels are rounded to whole numbers, with others not (0.29, 0.57).
+std::vector<plain_value> numbers_for_narrow_pixels()
 {
+    std::vector<plain_value> all;
+    for (const int64_t n : {1, 3, 127, 255, 257, 65535, -1, -3, -128, -32768})
+        all.push_back({storage::i32, n, 0});
+    for (const double n :
+         {0.5, 2.0, -37.0, 0.1, 0.29, 0.57, 1.0 / 3, 3.7, -2.6, 255.9, 300.25, 1 / 65535.0, 41000.5, -70000.5,
+          1 - 0x1p-40, 3 + 0x1p-45, 1e-30, -0.0, -1 / 3.0 * (1 + 0x1p-52)})
+        all.push_back({storage::f64, 0, n});
+    for (const double n : {-17.0, 3.5}) all.push_back({storage::f32, 0, n});
+    for (int i = 0; i < 8; ++i)
+        all.push_back({storage::f64, 0, std::ldexp(1 + std::fmod(i * 0.6180339887498949, 1.0), i - 4)});
+    return all;
+}
+
+TEST(Binary, EachNarrowPixelWithANumberFollowsTheDefinition)
+{
+    int turn = 0;
     for (const storage t : {storage::u8, storage::u16, storage::i8, storage::i16}) {
-        real_image a(t, {256, 256}, memory_layout::packed);
-        if (Arithmetic::bytes_of(t) == 1)
-            a.set([](int x, int) { return static_cast<uint8_t>(x); });
+        const int full = static_cast<int>(8 * Arithmetic::bytes_of(t));
+        const size s{full == 8 ? 100 : 256, full == 8 ? 3 : 256};
+        real_image a(t, s, memory_layout::packed);
+        if (full == 8)
+            a.set([](int x, int y) { return static_cast<uint8_t>(100 * y + x); });
         else
             a.set([](int x, int y) { return static_cast<uint16_t>(256 * y + x); });
-        for (const int64_t n :
-             {1, 2, 3, 7, 10, 127, 128, 255, 256, 257, 32767, 65535, -1, -3, -128, -32768}) {
-            const auto number = plain_value{storage::i32, n, 0};
-            const real_image dst(t, {256, 256}, memory_layout::packed);
-            if ((n < 0 && Arithmetic::is_unsigned(t)) || enough_failures()) continue;
-            step(name(t) + " by " + std::to_string(n), [&] {
-                for_each_level([&](level) {
-                    Arithmetic::combine(method::divide, saturate, a.view(), number_of(number), dst.view());
-                    dst.expect([&](int x, int y) {
-                        return by_definition(method::divide, true, a.at(x, y), number, t,
-                                             static_cast<int>(8 * Arithmetic::bytes_of(t)));
-                    });
-                });
-            });
-        }
+        for (const plain_value& n : numbers_for_narrow_pixels())
+            for (const method m : {method::add, method::subtract, method::reverse_subtract, method::multiply,
+                                   method::divide}) {
+                if (enough_failures() || (is_integer(n.type) && m != method::divide)) continue;
+                const int rounding = ++turn % 2 ? wrap : saturate, bits = turn % 3 ? full : full - 3;
+                step(name(t) + ", " + case_name(m, rounding) + ", " + std::to_string(n.whole) + " / " +
+                         std::to_string(n.real),
+                     [&] {
+                         for_each_level([&](level) {
+                             const real_image dst(t, s, memory_layout::packed);
+                             Arithmetic::combine(m, rounding, a.view(bits), number_of(n), dst.view(bits));
+                             dst.expect([&](int x, int y) {
+                                 return by_definition(m, rounding == saturate, a.at(x, y), n, t, bits);
+                             });
+                         });
+                     });
+            }
     }
 }
 

@@ -2,6 +2,7 @@
 #include "arithmetic/kernels/blocks.inl"
 #include "arithmetic/kernels/direct.inl"
 #include "arithmetic/kernels/mixed.inl"
+#include "arithmetic/kernels/narrow_numbers.inl"
 
 namespace Qor::Luxar::ZELT::ZELT_LEVEL {
 namespace arithmetic {
@@ -90,14 +91,23 @@ template <operation Op>
 constexpr void fill_mixed_forms(arithmetic_table& t)
 {
     using narrow = types<uint8_t, uint16_t, int16_t>;
-    using with_number = types<uint8_t, uint16_t, int16_t, float>;
     constexpr bool ordered = Op == operation::subtract || Op == operation::divide;
     fill_mixed<Op, mixed_form::real_right>(t, narrow{});
-    fill_mixed<Op, mixed_form::number_right>(t, with_number{});
+    fill_mixed<Op, mixed_form::number_right>(t, types<float>{});
     if constexpr (ordered) {
         fill_mixed<Op, mixed_form::real_left>(t, narrow{});
-        fill_mixed<Op, mixed_form::number_left>(t, with_number{});
+        fill_mixed<Op, mixed_form::number_left>(t, types<float>{});
     }
+    if constexpr (Op == operation::multiply || Op == operation::divide)
+        fill_mixed<Op, mixed_form::number_right>(t, narrow{}); // the factors that times_number can not have
+    if constexpr (Op == operation::divide) fill_mixed<Op, mixed_form::number_left>(t, narrow{});
+}
+
+template <class... T>
+constexpr void fill_narrow(arithmetic_table& t, types<T...>)
+{
+    ((t.plus_number[index_of<T>()] = plus_number<T>), ...);
+    ((t.times_number[index_of<T>()] = times_number<T>), ...);
 }
 
 template <class Part>
@@ -142,7 +152,10 @@ constexpr arithmetic_table make_table()
 
     const auto fill_forms = [&]<operation Op>() {
         fill_direct<Op, form::images>(t, real_types{});
-        fill_direct<Op, form::value_right>(t, real_types{});
+        if constexpr (Op == operation::divide) // narrow integers: times_number
+            fill_direct<Op, form::value_right>(t, types<uint32_t, int32_t, float, double>{});
+        else
+            fill_direct<Op, form::value_right>(t, real_types{});
     };
     fill_forms.template operator()<operation::add>();
     fill_forms.template operator()<operation::subtract>();
@@ -156,6 +169,7 @@ constexpr arithmetic_table make_table()
     fill_mixed_forms<operation::subtract>(t);
     fill_mixed_forms<operation::multiply>(t);
     fill_mixed_forms<operation::divide>(t);
+    fill_narrow(t, types<uint8_t, uint16_t, int8_t, int16_t>{});
     fill_complex<float>(t);
     fill_complex<double>(t);
     return t;

@@ -59,6 +59,22 @@ inline constexpr int form_count = 3;
 enum class mixed_form { real_right, real_left, number_right, number_left };
 inline constexpr int mixed_form_count = 4;
 
+/// Narrow integers plus a number: pixels, limited, plus a whole number and, below a limit, 1 more, low bits kept; then
+/// negated.
+struct narrow_sum {
+    int32_t least, greatest, whole, below;
+    bool negated;
+};
+/// Narrow integers times a number: the size of a pixel times a factor, whose fraction has twice the bits of a pixel,
+/// cut down, low bits kept. Pixels beyond the limits have results of their own.
+struct narrow_product {
+    uint32_t whole, fraction;
+    bool negative;
+    int32_t least, greatest, under, over;
+};
+using narrow_sum_function = void (*)(const uint8_t* src, uint8_t* dst, int64_t count, narrow_sum);
+using narrow_product_function = void (*)(const uint8_t* src, uint8_t* dst, int64_t count, narrow_product);
+
 struct arithmetic_table {
     load_function load[computing_count][storage_count];
     load_function load_byte[2]; ///< Float 32 and 64, truncated to one byte, to u32
@@ -66,7 +82,9 @@ struct arithmetic_table {
     store_function store[computing_count][storage_count][rounding_count];
     direct_function direct[operation_count][form_count][storage_count][rounding_count];
     direct_function mixed[operation_count][mixed_form_count][storage_count]
-                         [rounding_count]; ///< null: in blocks
+                         [rounding_count];       ///< null: in blocks
+    narrow_sum_function plus_number[real_count]; ///< for integers of one or two bytes, null for others
+    narrow_product_function times_number[real_count];
 };
 
 } // namespace Qor::Luxar::ZELT::Arithmetic

@@ -1,6 +1,7 @@
 #include "arithmetic/kernels/binary.h"
 
 #include "arithmetic/kernels/arithmetic_levels.h"
+#include "arithmetic/kernels/narrow_numbers.h"
 #include "arithmetic/kernels/plane.h"
 
 #include <cstring>
@@ -367,6 +368,41 @@ bool as_pixel(const number& b, storage type, operation op, rounding mode, void* 
     }
 }
 
+/// A packed image, or one of its rows, at a time.
+template <class Loop>
+void for_each_run(const plane& src, const plane& dst, size extent, Loop loop)
+{
+    const bool in_one_row = is_packed(dst, extent) && is_packed(src, extent);
+    const int64_t rows = in_one_row ? 1 : extent.height;
+    const int64_t count = in_one_row ? int64_t{extent.width} * extent.height : extent.width;
+    for (int64_t y = 0; y < rows; ++y) loop(src.at(0, y), dst.at(0, y), count);
+}
+
+/// Narrow integers with a number, in their own width; false if they can not.
+bool combine_narrow(operator_choice chosen, rounding mode, const plane& src, const number& b,
+                    const plane& dst, range limits, size extent, const arithmetic_table& table)
+{
+    const auto plus = table.plus_number[index(dst.type)];
+    const auto times = table.times_number[index(dst.type)];
+    if (!plus) return false;
+    if (chosen.op == operation::add || chosen.op == operation::subtract) {
+        narrow_sum sum;
+        if (!is_float(b.type) || !plan_sum(chosen.op, chosen.reversed, b, dst.type, mode, limits, &sum))
+            return false;
+        for_each_run(src, dst, extent, [&](auto from, auto to, int64_t n) { plus(from, to, n, sum); });
+        return true;
+    }
+    const bool divides = chosen.op == operation::divide && !chosen.reversed;
+    alignas(16) uint8_t value[16];
+    if (b.type == storage::f64 ? chosen.op != operation::multiply && !divides
+                               : !divides || !as_pixel(b, dst.type, chosen.op, mode, value))
+        return false;
+    narrow_product product;
+    if (!plan_product(chosen.op, b, dst.type, mode, limits, &product)) return false;
+    for_each_run(src, dst, extent, [&](auto from, auto to, int64_t n) { times(from, to, n, product); });
+    return true;
+}
+
 /// The number throughout a block, in the computing type.
 void fill_block(const number& b, computing c, block& to)
 {
@@ -413,27 +449,23 @@ outcome combine(method m, int32_t given_rounding, const image& a, const number& 
     const plane out = plane_of(dst, to);
     const range limits = range_of(dst.layout);
 
-    alignas(16) uint8_t value[16];
-    if (!chosen.assigns && from == to && !is_complex(to) && image_pixels.adjacent() && out.adjacent() &&
-        as_pixel(b, to, chosen.op, mode, value)) {
-        const plane single{value, 0, 0, to};
-        const bool in_one_row = is_packed(out, extent) && is_packed(image_pixels, extent);
-        const form f = chosen.reversed ? form::value_left : form::value_right;
-        run_direct(table.direct[index(chosen.op)][index(f)][index(to)][index(mode)],
-                   chosen.reversed ? single : image_pixels, chosen.reversed ? image_pixels : single, out,
-                   limits, extent, in_one_row);
-        return outcome::done;
-    }
-    if (!chosen.assigns && from == to && b.type == storage::f64 && image_pixels.adjacent() &&
-        out.adjacent()) {
-        const mixed_form f = chosen.reversed ? mixed_form::number_left : mixed_form::number_right;
-        const direct_function mixed = table.mixed[index(chosen.op)][index(f)][index(to)][index(mode)];
-        if (mixed) {
+    if (!chosen.assigns && from == to && !is_complex(to) && image_pixels.adjacent() && out.adjacent()) {
+        if (combine_narrow(chosen, mode, image_pixels, b, out, limits, extent, table)) return outcome::done;
+        alignas(16) uint8_t value[16];
+        direct_function loop = nullptr;
+        if (as_pixel(b, to, chosen.op, mode, value)) {
+            const form f = chosen.reversed ? form::value_left : form::value_right;
+            loop = table.direct[index(chosen.op)][index(f)][index(to)][index(mode)];
+        } else if (b.type == storage::f64) {
+            const mixed_form f = chosen.reversed ? mixed_form::number_left : mixed_form::number_right;
+            loop = table.mixed[index(chosen.op)][index(f)][index(to)][index(mode)];
             std::memcpy(value, &b.real, sizeof b.real);
-            const plane single{value, 0, 0, storage::f64};
-            const bool in_one_row = is_packed(out, extent) && is_packed(image_pixels, extent);
-            run_direct(mixed, chosen.reversed ? single : image_pixels,
-                       chosen.reversed ? image_pixels : single, out, limits, extent, in_one_row);
+        }
+        if (loop) {
+            for_each_run(image_pixels, out, extent, [&](auto from_row, auto to_row, int64_t n) {
+                loop(chosen.reversed ? value : from_row, chosen.reversed ? from_row : value, to_row, n,
+                     limits);
+            });
             return outcome::done;
         }
     }

@@ -108,29 +108,6 @@ contiguous_row<T> advanced(contiguous_row<T> row, int64_t pixels)
     return {row.first + pixels * static_cast<int64_t>(sizeof(T))};
 }
 
-/// The quotient by a number that is not 0, which is multiplied by instead. Half a dividend more puts the products between
-/// the whole numbers, further from them than they are wrong.
-template <class T>
-int32_t quotient_by_inverse(T a, float inverse)
-{
-    const float half = a < 0 ? -0.5f : 0.5f;
-    return static_cast<int32_t>((static_cast<float>(a) + half) * inverse);
-}
-
-template <rounding Mode, class T, class A>
-void divide_by_number(A a, T number, contiguous_row<T> dst, int64_t count, range limits)
-{
-    const float inverse = 1 / static_cast<float>(number);
-    const bounds<int32_t> limit(limits);
-    each(
-        count,
-        [=](T v) {
-            const int32_t q = quotient_by_inverse(v, inverse);
-            return static_cast<T>(Mode == rounding::saturate ? clamp(q, limit) : q);
-        },
-        dst, a);
-}
-
 /// A piece without zeros takes the fast way through real numbers.
 template <rounding Mode, class T, class A, class B>
 void divide_integers(A a, B b, contiguous_row<T> dst, int64_t count, range limits)
@@ -161,12 +138,7 @@ void direct(const uint8_t* a, const uint8_t* b, uint8_t* dst, int64_t count, ran
     const auto x = operand<Form, form::value_left, T>(a);
     const auto y = operand<Form, form::value_right, T>(b);
     const contiguous_row<T> out{dst};
-    if constexpr (Op == operation::divide && Form == form::value_right && is_integer<T> && sizeof(T) < 4) {
-        if (y.value != 0)
-            divide_by_number<Mode, T>(x, y.value, out, count, limits);
-        else
-            divide_integers<Mode>(x, y, out, count, limits);
-    } else if constexpr (Op == operation::divide && is_integer<T>) {
+    if constexpr (Op == operation::divide && is_integer<T>) {
         divide_integers<Mode>(x, y, out, count, limits);
     } else if constexpr (is_pair<T>) {
         each(
