@@ -105,6 +105,25 @@ void register_absolute(const char* type, int size)
     zelt_bench::register_peer(name, "absdiff", peer);
 }
 
+/// The limit lies, within a bin, in the middle between the means of both sides, in bins from the least pixel on, and
+/// the output has its two classes.
+template <class T>
+bool is_divided(const frames& f, double limit)
+{
+    double least = 0, greatest = 0;
+    cv::minMaxLoc(f.src, &least, &greatest);
+    const double range = greatest - least, scale = range >= 127 ? 1 : 128 / (std::trunc(range) + 1);
+    double sum[2] = {}, pixels[2] = {};
+    for (auto p = f.src.begin<T>(), q = f.dst.begin<T>(); p != f.src.end<T>(); ++p, ++q) {
+        const double bin = std::trunc((*p - least) * scale);
+        const int side = bin < std::trunc(limit) ? 0 : 1;
+        sum[side] += bin;
+        pixels[side] += 1;
+        if (*q != (*p < limit ? T{0} : *p > limit ? T{1} : *p)) return false;
+    }
+    return std::fabs(limit - 0.5 * (sum[0] / pixels[0] + sum[1] / pixels[1])) <= 1;
+}
+
 template <class T>
 void register_auto_threshold(const char* type, int size)
 {
@@ -113,16 +132,10 @@ void register_auto_threshold(const char* type, int size)
         frames& f = frames_of<T>(size);
         const double limit = Arithmetic::find_threshold(view_of<T>(f.src));
         Arithmetic::threshold(view_of<T>(f.src), {limit, 0, limit, 1}, view_of<T>(f.dst));
+        return limit;
     };
     zelt_bench::register_case(
-        name,
-        [=] {
-            work();
-            double least = 0, greatest = 0;
-            cv::minMaxLoc(frames_of<T>(size).dst, &least, &greatest);
-            return greatest >= 1;
-        },
-        work);
+        name, [=] { return is_divided<T>(frames_of<T>(size), work()); }, [=] { work(); });
     zelt_bench::register_copy(name, size_t(size) * size_t(size) * sizeof(T));
     if constexpr (std::is_unsigned_v<T>)
         zelt_bench::register_peer(name, "threshold-otsu", [=] {
