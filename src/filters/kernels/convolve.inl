@@ -60,7 +60,7 @@ template <int Rows, int Count, class E>
 }
 
 /// Asks for the memory that is needed next: beside the output, which is as good as never in a cache, and in
-/// the source, whose rows are each read in one go.
+/// the source, whose rows are each read in one go. A little at a time: many requests at once wait for each other.
 template <int Rows, class E>
 ZELT_INLINE void prefetch(const convolve_rows<E>& job, uint8_t* const* to, int64_t begin, int64_t end)
 {
@@ -75,15 +75,18 @@ ZELT_INLINE void prefetch(const convolve_rows<E>& job, uint8_t* const* to, int64
 template <class T, int Rows, int Count, class E>
 void sum_rows(const convolve_rows<E>& job, uint8_t* const* to)
 {
-    constexpr int64_t chunk = 256, bytes = sizeof(T);
+    constexpr int64_t chunk = 192, bytes = sizeof(T), columns = Count * lanes;
+    static_assert(chunk % columns == 0);
     const int64_t elements = job.elements;
     alignas(64) double sums[Rows][chunk];
     double* into[Rows];
     for (int64_t begin = 0; begin < elements; begin += chunk) {
         const int64_t end = elements - begin < chunk ? elements : begin + chunk;
-        prefetch<Rows>(job, to, begin * bytes, end * bytes);
         for (int r = 0; r < Rows; ++r) into[r] = sums[r] - begin;
-        for (int64_t x = begin; x < end; x += Count * lanes) sum_tile<Rows, Count>(job, x, into);
+        for (int64_t x = begin; x < end; x += columns) {
+            prefetch<Rows>(job, to, (x + chunk) * bytes, (x + chunk + columns) * bytes);
+            sum_tile<Rows, Count>(job, x, into);
+        }
         for (int r = 0; r < Rows; ++r) {
             int64_t x = begin;
             for (; x + lanes <= end; x += lanes) store_as<T>(load_vector(into[r] + x), to[r] + x * bytes);
@@ -98,7 +101,7 @@ void sum(const convolve_rows<E>& job, uint8_t* const* to)
     if (job.output_rows == 1)
         sum_rows<T, 1, 4>(job, to);
     else
-        sum_rows<T, 4, vector_bytes == 64 ? 4 : 2>(job, to);
+        sum_rows<T, 4, vector_bytes == 64 ? 6 : 2>(job, to);
 }
 
 // A kernel of 3 x 3, the one in most use, without loops.
