@@ -1,10 +1,11 @@
 // The loops of the functions of a pixel, on adjacent pixels.
 //
 // Single precision: elementary.inl, with the plainest form for runs of ordinary values; the careful form gives those the
-// same bits. Double precision, and angles too large for a quick reduction: SLEEF's functions for results that are the
-// same on every processor, within one unit in the last place of a double.
+// same bits. Logarithms of double precision: doubles.inl. The rest of double precision, and angles too large for a quick
+// reduction: SLEEF's functions for results that are the same on every processor, within one unit in the last place.
 #pragma once
 
+#include "arithmetic/kernels/doubles.inl"
 #include "arithmetic/kernels/elementary.inl"
 #include "arithmetic/kernels/functions_table.h"
 #include "arithmetic/kernels/operators.inl"
@@ -135,24 +136,17 @@ inline void map_arc_tangent_2(const uint8_t* a, const uint8_t* b, uint8_t* to, i
 
 #if defined(__AVX512F__)
 inline reals exponential_of_double(reals x) { return Sleef_cinz_expd8_u10avx512fnofma(x); }
-inline reals logarithm_of_double(reals x) { return Sleef_cinz_logd8_u10avx512fnofma(x); }
 inline reals power_of_double(reals x, reals y) { return Sleef_cinz_powd8_u10avx512fnofma(x, y); }
 #elif defined(__AVX2__)
 inline reals exponential_of_double(reals x) { return Sleef_cinz_expd4_u10avx(x); }
-inline reals logarithm_of_double(reals x) { return Sleef_cinz_logd4_u10avx(x); }
 inline reals power_of_double(reals x, reals y) { return Sleef_cinz_powd4_u10avx(x, y); }
 #elif defined(__SSE2__)
 inline reals exponential_of_double(reals x) { return Sleef_cinz_expd2_u10sse2(x); }
-inline reals logarithm_of_double(reals x) { return Sleef_cinz_logd2_u10sse2(x); }
 inline reals power_of_double(reals x, reals y) { return Sleef_cinz_powd2_u10sse2(x, y); }
 #else
 inline reals exponential_of_double(reals x)
 {
     return reals{Sleef_cinz_expd1_u10purec(x[0]), Sleef_cinz_expd1_u10purec(x[1])};
-}
-inline reals logarithm_of_double(reals x)
-{
-    return reals{Sleef_cinz_logd1_u10purec(x[0]), Sleef_cinz_logd1_u10purec(x[1])};
 }
 inline reals power_of_double(reals x, reals y)
 {
