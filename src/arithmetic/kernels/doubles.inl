@@ -145,4 +145,43 @@ inline reals logarithm_of_double(reals x)
     return all_ordinary(x) ? logarithm_of_normal(x) : logarithm_of_any(x);
 }
 
+/// 16 / log 2, and log 2 / 16 in two parts. The first has 38 bits, so that its product with a whole number of up to
+/// 15 bits is exact.
+inline constexpr double sixteenths = 0x1.71547652b82fep4;
+inline constexpr double sixteenth_high = 0x1.62e42fefa4p-5;
+inline constexpr double sixteenth_low = -0x1.8432a1b0e2634p-47;
+
+/// mantissa 2^floor(n / 16), rounded once; bits end in n + 32 * 1023.
+inline reals scaled(reals mantissa, [[maybe_unused]] reals n, [[maybe_unused]] words bits)
+{
+#if defined(__AVX512F__)
+    return _mm512_maskz_scalef_pd(0xff, mantissa, n * (1.0 / 16));
+#else
+    const words half = (bits >> 5) << 52; // two powers, since one may be no normal number
+    return (mantissa * reals_of(half)) * reals_of(((bits >> 4) << 52) - half);
+#endif
+}
+
+/// exp(x + rest), where the rest is far below a unit of x. From -745.2 to 709.8 it is neither 0 nor infinite.
+template <class... Rest>
+reals exponential_of_sum(reals x, Rest... rest)
+{
+    const reals limited = at_most(at_least(x, -746), all(710));
+    constexpr double shift = whole + 32 * 1023; // leaves the exponents of two factors in the low bits
+    const reals shifted = limited * sixteenths + shift;
+    const reals n = shifted - shift;
+    const reals r = ((product_plus(n, all(-sixteenth_high), limited) - n * sixteenth_low) + ... + rest);
+    const words bits = bits_of(shifted);
+    const reals square = r * r; // and short chains of sums
+    const reals front = r * 0x1.5555555555557p-3 + 0x1.0000000000001p-1;
+    const reals middle = r * 0x1.11111110ab2dp-7 + 0x1.55555554e8d7ep-5;
+    const reals back = r * 0x1.a01b65bf46ca8p-13 + 0x1.6c17ede66a746p-10;
+    const reals grown = r + square * (front + square * (middle + square * back));
+    const reals from = entry(powers_16.high, bits);
+    const reals mantissa = from + (entry(powers_16.low, bits) + from * grown);
+    return scaled(mantissa, n, bits);
+}
+
+inline reals exponential_of_double(reals x) { return exponential_of_sum(x); }
+
 } // namespace Qor::Luxar::ZELT::ZELT_LEVEL::functions

@@ -1,7 +1,7 @@
 // The loops of the functions of a pixel, on adjacent pixels.
 //
 // Single precision: elementary.inl, with the plainest form for runs of ordinary values; the careful form gives those the
-// same bits. Logarithms of double precision: doubles.inl. The rest of double precision, and angles too large for a quick
+// same bits. Exponentials and logarithms of double precision: doubles.inl. Its powers, and angles too large for a quick
 // reduction: SLEEF's functions for results that are the same on every processor, within one unit in the last place.
 #pragma once
 
@@ -135,19 +135,12 @@ inline void map_arc_tangent_2(const uint8_t* a, const uint8_t* b, uint8_t* to, i
 }
 
 #if defined(__AVX512F__)
-inline reals exponential_of_double(reals x) { return Sleef_cinz_expd8_u10avx512fnofma(x); }
 inline reals power_of_double(reals x, reals y) { return Sleef_cinz_powd8_u10avx512fnofma(x, y); }
 #elif defined(__AVX2__)
-inline reals exponential_of_double(reals x) { return Sleef_cinz_expd4_u10avx(x); }
 inline reals power_of_double(reals x, reals y) { return Sleef_cinz_powd4_u10avx(x, y); }
 #elif defined(__SSE2__)
-inline reals exponential_of_double(reals x) { return Sleef_cinz_expd2_u10sse2(x); }
 inline reals power_of_double(reals x, reals y) { return Sleef_cinz_powd2_u10sse2(x, y); }
 #else
-inline reals exponential_of_double(reals x)
-{
-    return reals{Sleef_cinz_expd1_u10purec(x[0]), Sleef_cinz_expd1_u10purec(x[1])};
-}
 inline reals power_of_double(reals x, reals y)
 {
     return reals{Sleef_cinz_powd1_u10purec(x[0], y[0]), Sleef_cinz_powd1_u10purec(x[1], y[1])};
