@@ -76,9 +76,11 @@ inline reals exponent_in(words raised)
 #if defined(__AVX512F__)
 inline reals product_plus(reals a, reals b, reals c) { return _mm512_fmadd_pd(a, b, c); }
 inline reals product_minus_1(reals a, reals b) { return _mm512_fmsub_pd(a, b, all(1)); }
+inline reals rest_of_product(reals a, reals b, reals product) { return _mm512_fmsub_pd(a, b, product); }
 #elif defined(__FMA__)
 inline reals product_plus(reals a, reals b, reals c) { return _mm256_fmadd_pd(a, b, c); }
 inline reals product_minus_1(reals a, reals b) { return _mm256_fmsub_pd(a, b, all(1)); }
+inline reals rest_of_product(reals a, reals b, reals product) { return _mm256_fmsub_pd(a, b, product); }
 #else
 /// a b + c, where a b is exact.
 inline reals product_plus(reals a, reals b, reals c) { return a * b + c; }
@@ -87,6 +89,15 @@ inline reals product_minus_1(reals a, reals b)
 {
     const reals high = reals_of(bits_of(a) & ~uint64_t{0x7ffffff});
     return (high * b - 1) + (a - high) * b;
+}
+/// a, rounded to 26 bits; what is left has no more either.
+inline reals upper_half(reals a) { return reals_of((bits_of(a) + 0x4000000) & ~uint64_t{0x7ffffff}); }
+/// a b - product, where product is a b rounded.
+inline reals rest_of_product(reals a, reals b, reals product)
+{
+    const reals a_high = upper_half(a), b_high = upper_half(b);
+    const reals a_low = a - a_high, b_low = b - b_high;
+    return (((a_high * b_high - product) + a_high * b_low) + a_low * b_high) + a_low * b_low;
 }
 #endif
 
@@ -183,5 +194,56 @@ reals exponential_of_sum(reals x, Rest... rest)
 }
 
 inline reals exponential_of_double(reals x) { return exponential_of_sum(x); }
+
+/// Two numbers whose sum counts. The second is below half a unit of the first.
+struct sum_of_reals {
+    reals high, low;
+};
+
+/// log(x) to some 66 bits, for a positive, finite x that is not denormal.
+template <class Adjust = unchanged>
+sum_of_reals logarithm_in_parts(reals x, Adjust adjust = {})
+{
+    const auto [high, low, r] = split(logarithms_32, x, adjust);
+    const reals sum = high + r;
+    const reals lost = (high - sum) + r;
+    const reals half = r * -0.5;
+    const reals curve = half * r;
+    const reals curved = sum + curve;
+    const reals lost_of_curve = ((sum - curved) + curve) + rest_of_product(half, r, curve);
+    const reals square = r * r;
+    const reals front = (r * -0x1.ffffffffffffdp-3 + 0x1.5555555555555p-2) +
+                        square * (r * -0x1.555555556c9dp-3 + 0x1.99999999a2d5ap-3);
+    const reals back = (r * -0x1.fffff9e100d18p-4 + 0x1.2492472dd4a13p-3) +
+                       square * (r * -0x1.99e8010f5b48p-4 + 0x1.c760dd71bd3f5p-4);
+    const reals rest = (square * r) * (front + square * square * back) + ((low + lost) + lost_of_curve);
+    const reals result = curved + rest;
+    return {result, (curved - result) + rest};
+}
+
+/// x^exponent by the logarithm of x, for an exponent of up to largest_exponent.
+inline constexpr double largest_exponent = 0x1p16;
+inline reals power_by_logarithm(sum_of_reals log, reals exponent)
+{
+    const reals product = log.high * exponent;
+    return exponential_of_sum(product, rest_of_product(log.high, exponent, product) + log.low * exponent);
+}
+
+/// x^exponent for any x. The exponent is neither 0, nor infinite, nor NaN; above 2^65 it is as good as infinite but for x = 1.
+[[gnu::noinline, gnu::cold]] inline reals power_of_any(reals x, exponent_kind kind)
+{
+    const reals exponent = at_most(at_least(all(kind.exponent), -0x1p65), all(0x1p65));
+    const reals a = magnitude(x);
+    const auto denormal = a < least_normal;
+    const auto [high, low] =
+        logarithm_in_parts(denormal ? a * 0x1p54 : a, [=](reals e) { return denormal ? e - 54 : e; });
+    const reals product = high * exponent;
+    const reals rest = rest_of_product(high, exponent, product) + low * exponent;
+    const reals ordinary = exponential_of_sum(product, at_most(at_least(rest, -0x1p-10), all(0x1p-10)));
+    const reals of_zero = all(kind.exponent > 0 ? 0 : infinity);
+    const reals of_infinity = all(kind.exponent > 0 ? infinity : 0);
+    const reals size = a == 0 ? of_zero : a < infinity ? ordinary : a == infinity ? of_infinity : a;
+    return power_with_sign(x, size, kind);
+}
 
 } // namespace Qor::Luxar::ZELT::ZELT_LEVEL::functions

@@ -197,15 +197,20 @@ inline reals power_of_ordinary(reals x, double exponent)
     return exponential_2(logarithm_2_of_ordinary(x) * exponent);
 }
 
-inline reals power(reals x, exponent_kind kind)
+/// The power of x, where size is that of its magnitude.
+inline reals power_with_sign(reals x, reals size, exponent_kind kind)
 {
-    const reals a = magnitude(x);
-    const reals log_a = a == 0 ? all(-infinity) : logarithm_2_of_ordinary(a);
-    const reals size = exponential_2((a < infinity ? log_a : a) * kind.exponent);
     const reals signed_size = with_sign(size, bits_of(x) & kind.sign);
     if (kind.whole) return signed_size;
     const reals of_negative = x > -infinity ? all(__builtin_nan("")) : signed_size;
     return x < 0 ? of_negative : signed_size;
+}
+
+inline reals power(reals x, exponent_kind kind)
+{
+    const reals a = magnitude(x);
+    const reals log_a = a == 0 ? all(-infinity) : logarithm_2_of_ordinary(a);
+    return power_with_sign(x, exponential_2((a < infinity ? log_a : a) * kind.exponent), kind);
 }
 
 } // namespace Qor::Luxar::ZELT::ZELT_LEVEL::functions

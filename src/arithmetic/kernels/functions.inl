@@ -1,8 +1,8 @@
 // The loops of the functions of a pixel, on adjacent pixels.
 //
 // Single precision: elementary.inl, with the plainest form for runs of ordinary values; the careful form gives those the
-// same bits. Exponentials and logarithms of double precision: doubles.inl. Its powers, and angles too large for a quick
-// reduction: SLEEF's functions for results that are the same on every processor, within one unit in the last place.
+// same bits. Double precision: doubles.inl. Angles too large for a quick reduction: SLEEF's functions for results that are
+// the same on every processor, within one unit in the last place of a double.
 #pragma once
 
 #include "arithmetic/kernels/doubles.inl"
@@ -134,19 +134,6 @@ inline void map_arc_tangent_2(const uint8_t* a, const uint8_t* b, uint8_t* to, i
         to, count, [](reals y, reals x) { return arc_tangent_2(y, x); }, a, b);
 }
 
-#if defined(__AVX512F__)
-inline reals power_of_double(reals x, reals y) { return Sleef_cinz_powd8_u10avx512fnofma(x, y); }
-#elif defined(__AVX2__)
-inline reals power_of_double(reals x, reals y) { return Sleef_cinz_powd4_u10avx(x, y); }
-#elif defined(__SSE2__)
-inline reals power_of_double(reals x, reals y) { return Sleef_cinz_powd2_u10sse2(x, y); }
-#else
-inline reals power_of_double(reals x, reals y)
-{
-    return reals{Sleef_cinz_powd1_u10purec(x[0], y[0]), Sleef_cinz_powd1_u10purec(x[1], y[1])};
-}
-#endif
-
 template <class T>
 void map_exponential(const uint8_t* from, uint8_t* to, int64_t count)
 {
@@ -186,6 +173,32 @@ inline reals unusual_power(reals x, double exponent)
     return x == x ? of_number : x;
 }
 
+/// The logarithms of a run come first, so that the processor has the sums of several vectors to work at.
+inline void map_power_of_doubles(const uint8_t* from, uint8_t* to, int64_t count, exponent_kind kind)
+{
+    constexpr int64_t size = sizeof(double);
+    const auto careful = [=](reals x) { return power_of_any(x, kind); };
+    const bool usual = kind.exponent <= largest_exponent && kind.exponent >= -largest_exponent;
+    const int64_t end = usual ? count / lanes * lanes : 0;
+    for (int64_t first = 0; first < end; first += run_length) {
+        const int64_t n = end - first < run_length ? end - first : run_length;
+        const auto* const in = reinterpret_cast<const double*>(from + first * size);
+        auto* const out = reinterpret_cast<double*>(to + first * size);
+        double high[run_length], low[run_length];
+        for (int64_t i = 0; i < n; i += lanes) {
+            const auto log = logarithm_in_parts(load(in + i));
+            store(high + i, log.high);
+            store(low + i, log.low);
+        }
+        for (int64_t i = 0; i < n; i += lanes) {
+            const reals x = load(in + i);
+            const sum_of_reals log{load(high + i), load(low + i)};
+            store(out + i, all_ordinary(x) ? power_by_logarithm(log, all(kind.exponent)) : careful(x));
+        }
+    }
+    map<double>(to + end * size, count - end, careful, from + end * size);
+}
+
 /// A single product or root: exactly rounded from double precision or at once, to the same bits.
 template <class Function>
 void map_singles(const uint8_t* from, uint8_t* to, int64_t count, Function f)
@@ -210,10 +223,10 @@ void map_power(const uint8_t* from, uint8_t* to, int64_t count, double exponent)
     }
     if (exponent == 2) return map_all([](reals x) { return x * x; });
     if (exponent == 0.5) return map_all([](reals x) { return root(x == -infinity ? -x : x + 0.0); });
+    const exponent_kind kind = kind_of(exponent);
     if constexpr (sizeof(T) == sizeof(double)) {
-        map_all([y = all(exponent)](reals x) { return power_of_double(x, y); });
+        map_power_of_doubles(from, to, count, kind);
     } else {
-        const exponent_kind kind = kind_of(exponent);
         each_run<T>(count, [=](int64_t first, int64_t n) {
             if (are_ordinary(from + first, n))
                 map<T>(
