@@ -11,6 +11,7 @@
 #include <opencv2/imgproc.hpp>
 
 #include <memory>
+#include <type_traits>
 #include <vector>
 
 namespace {
@@ -19,22 +20,25 @@ using namespace Qor::Luxar;
 using namespace Qor::Luxar::ZELT;
 using namespace zelt_bench;
 
-/// Positive weights with a sum of 1, none like the other.
+/// Positive weights with a sum of 1, none like the other: of doubles, or of floats, whose products with pixels of up to
+/// 24 bits are exact.
+template <class W>
 std::vector<double> weights(int length)
 {
     std::vector<double> w;
     double sum = 0;
     for (int i = 0; i < length * length; ++i) sum += w.emplace_back(1 + (i * 7919 % 1009) / 1009.0);
-    for (double& v : w) v /= sum;
+    for (double& v : w) v = static_cast<W>(v / sum);
     return w;
 }
 
-template <class T>
+template <class T, class W = double>
 void register_convolve(int length)
 {
-    const std::string operation = "Convolve-" + std::to_string(length) + "x" + std::to_string(length);
+    const std::string operation = "Convolve-" + std::to_string(length) + "x" + std::to_string(length) +
+                                  (std::is_same_v<W, float> ? "-of-floats" : "");
     const std::string name = frame_case<T>(operation);
-    const auto kernel = std::make_shared<std::vector<double>>(weights(length));
+    const auto kernel = std::make_shared<std::vector<double>>(weights<W>(length));
     const auto work_on = [=](Thread::ThreadPool* pool) {
         auto& f = frames_of<T>();
         Filters::convolve(view_of<T>(f.src), {kernel->data(), length, length}, {length / 2, length / 2},
@@ -53,7 +57,7 @@ void register_convolve(int length)
     register_copy(name, pixels_of_frames * sizeof(T));
     register_peer(name, "filter2D", peer);
 
-    if (length != 7) return;
+    if (length != 7 || std::is_same_v<W, float>) return;
     constexpr int workers = 2;
     const auto pool = std::make_shared<Thread::MultiThreadedPool>(workers);
     const std::string threaded = name + "-on-" + std::to_string(workers);
@@ -127,6 +131,7 @@ template <class T>
 void register_all()
 {
     for (const int length : {3, 7, 15, 31}) register_convolve<T>(length);
+    for (const int length : {3, 7}) register_convolve<T, float>(length);
     for (const auto& g : gradient_cases) register_gradient<T>(g);
 }
 

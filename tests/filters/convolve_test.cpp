@@ -16,7 +16,9 @@ struct taps {
     Filters::kernel_view view() const { return {values.data(), width, height}; }
 };
 
-enum class of { fractions, whole_numbers, small_sum, powers };
+/// Products of floats with values of 29 bits are exact. With 30 bits they are rounded; opposite ones still cancel where
+/// pixels are alike, unless only one of them is rounded. Huge products leave the range of doubles.
+enum class of { fractions, whole_numbers, small_sum, powers, opposites_29, opposites_30, huge };
 
 taps kernel_of(size s, coordinate<int32_t> anchor, of kind)
 {
@@ -31,6 +33,9 @@ taps kernel_of(size s, coordinate<int32_t> anchor, of kind)
         case of::small_sum:
             k.values.push_back((unit + 0.5) / count);
             break; // results stay in the range of the type
+        case of::opposites_29: k.values.push_back((i % 2 == 0 ? 0x1.6789ABDp0 : -0x1.6789ABDp0)); break;
+        case of::opposites_30: k.values.push_back((i % 2 == 0 ? 0x1.6789ABD8p0 : -0x1.6789ABD8p0)); break;
+        case of::huge: k.values.push_back(std::ldexp(static_cast<double>(random() % 7) - 3, 1015)); break;
         case of::powers: k.values.push_back(std::ldexp(unit, static_cast<int>(random() % 80) - 40)); break;
         }
     }
@@ -51,6 +56,9 @@ const std::vector<taps>& kernels()
                                        kernel_of({7, 7}, {3, 3}, of::small_sum),
                                        kernel_of({5, 5}, {2, 2}, of::small_sum),
                                        kernel_of({15, 9}, {7, 4}, of::small_sum),
+                                       kernel_of({4, 1}, {-100, 0}, of::opposites_29),
+                                       kernel_of({4, 1}, {100, 0}, of::opposites_30),
+                                       kernel_of({3, 3}, {1, 1}, of::huge),
                                        kernel_of({6, 23}, {5, 0}, of::fractions),
                                        kernel_of({41, 3}, {2147483647, -2147483647}, of::fractions)};
     return all;

@@ -5,6 +5,9 @@
 #include "filters/kernels/row_ring.h"
 #include "threads/run_parallel.h"
 
+#include <algorithm>
+#include <cmath>
+
 namespace Qor::Luxar::ZELT::Filters {
 namespace {
 
@@ -20,12 +23,33 @@ struct convolve_operands {
 
 bool is_3x3(const kernel_view& k) { return k.width == 3 && k.height == 3; }
 
+/// Bits that hold a pixel's number but for its exponent and sign.
+int significant_bits(pixel_type type)
+{
+    return type == pixel_type::float_32   ? 24
+           : type == pixel_type::float_64 ? 53
+                                          : static_cast<int>(GetPixmatBits(type));
+}
+
+/// True when products of the kernel's values with any pixel fit into doubles: they have few enough bits, and
+/// even a float's exponent cannot take them out of range.
+bool has_exact_products(const kernel_view& k, pixel_type type)
+{
+    constexpr int far_exponent = 800;
+    const int bits = 53 - significant_bits(type);
+    return std::all_of(k.values, k.values + int64_t{k.width} * k.height, [bits](double v) {
+        int exponent = 0;
+        const double whole = std::ldexp(std::frexp(v, &exponent), bits);
+        return std::isfinite(v) && whole == std::trunc(whole) && std::abs(exponent) < far_exponent;
+    });
+}
+
 /// A convolution over source rows of E, and what its workers need for themselves.
 template <class E>
 class convolution {
 public:
     convolution(const convolve_operands& o, const convolve_loops<E>& loops, int workers)
-        : o_(o), sum_(is_3x3(o.kernel) ? loops.sum_3x3 : loops.sum), channels_(channels_of(o.src.type)),
+        : o_(o), sum_(chosen(o, loops)), channels_(channels_of(o.src.type)),
           contiguous_(o.src.x_stride == channels_ * GetPixmatBits(element_of(o.src.type)) / 8)
     {
         if (o_.kernel.width == 0 || o_.kernel.height == 0) o_.kernel = {o.kernel.values, 0, 0};
@@ -50,6 +74,14 @@ public:
     }
 
 private:
+    using sum_function = void (*)(const convolve_rows<E>&, uint8_t* const* to);
+
+    static sum_function chosen(const convolve_operands& o, const convolve_loops<E>& loops)
+    {
+        const auto& sums = has_exact_products(o.kernel, element_of(o.src.type)) ? loops.sum_exact : loops.sum;
+        return is_3x3(o.kernel) ? sums.size_3x3 : sums.any_size;
+    }
+
     struct scratch {
         row_ring<E> source;
         std::vector<const E*> rows;
@@ -80,7 +112,7 @@ private:
     }
 
     convolve_operands o_;
-    void (*sum_)(const convolve_rows<E>&, uint8_t* const* to);
+    sum_function sum_;
     int32_t channels_;
     bool contiguous_;
     std::vector<scratch> workers_;

@@ -13,7 +13,7 @@ using Filters::convolve_rows;
 
 /// Adds one source row's products to output rows First to Last. kernel: the row of the kernel that the source
 /// row meets in output row First; output row First + 1 meets the one before it.
-template <int First, int Last, int Rows, int Count, class E>
+template <joined How, int First, int Last, int Rows, int Count, class E>
 ZELT_INLINE void add_row(tile<Rows, Count>& sum, const double* kernel, int64_t width, const E* x,
                          int64_t step)
 {
@@ -21,12 +21,12 @@ ZELT_INLINE void add_row(tile<Rows, Count>& sum, const double* kernel, int64_t w
     for (int64_t i = 0; i < width; ++i, x -= step) {
         vectors<Count> v;
         load(v, x);
-        add_products<First, Last>(sum, kernel + i, width, v);
+        add_products<How, First, Last>(sum, kernel + i, width, v);
     }
 }
 
 /// As much of some output rows as a tile holds, from column x on, for a kernel of any size.
-template <int Rows, int Count, class E>
+template <joined How, int Rows, int Count, class E>
 [[gnu::noinline]] void sum_tile(const convolve_rows<E>& job, int64_t x, double* const* to)
 {
     const int64_t width = job.kernel_width, height = job.kernel_height, step = job.step;
@@ -40,19 +40,19 @@ template <int Rows, int Count, class E>
         const int64_t last = y < Rows ? y : Rows - 1;
         const double* const k = kernel + (y - first) * width;
         if constexpr (Rows == 1) {
-            add_row<0, 0>(sum, k, width, row, step);
+            add_row<How, 0, 0>(sum, k, width, row, step);
         } else {
             switch (first * Rows + last) {
-            case 0: add_row<0, 0>(sum, k, width, row, step); break;
-            case 1: add_row<0, 1>(sum, k, width, row, step); break;
-            case 2: add_row<0, 2>(sum, k, width, row, step); break;
-            case 3: add_row<0, 3>(sum, k, width, row, step); break;
-            case 5: add_row<1, 1>(sum, k, width, row, step); break;
-            case 6: add_row<1, 2>(sum, k, width, row, step); break;
-            case 7: add_row<1, 3>(sum, k, width, row, step); break;
-            case 10: add_row<2, 2>(sum, k, width, row, step); break;
-            case 11: add_row<2, 3>(sum, k, width, row, step); break;
-            default: add_row<3, 3>(sum, k, width, row, step); break;
+            case 0: add_row<How, 0, 0>(sum, k, width, row, step); break;
+            case 1: add_row<How, 0, 1>(sum, k, width, row, step); break;
+            case 2: add_row<How, 0, 2>(sum, k, width, row, step); break;
+            case 3: add_row<How, 0, 3>(sum, k, width, row, step); break;
+            case 5: add_row<How, 1, 1>(sum, k, width, row, step); break;
+            case 6: add_row<How, 1, 2>(sum, k, width, row, step); break;
+            case 7: add_row<How, 1, 3>(sum, k, width, row, step); break;
+            case 10: add_row<How, 2, 2>(sum, k, width, row, step); break;
+            case 11: add_row<How, 2, 3>(sum, k, width, row, step); break;
+            default: add_row<How, 3, 3>(sum, k, width, row, step); break;
             }
         }
     }
@@ -72,7 +72,7 @@ ZELT_INLINE void prefetch(const convolve_rows<E>& job, uint8_t* const* to, int64
         }
 }
 
-template <class T, int Rows, int Count, class E>
+template <joined How, class T, int Rows, int Count, class E>
 void sum_rows(const convolve_rows<E>& job, uint8_t* const* to)
 {
     constexpr int64_t chunk = 192, bytes = sizeof(T), columns = Count * lanes;
@@ -85,7 +85,7 @@ void sum_rows(const convolve_rows<E>& job, uint8_t* const* to)
         for (int r = 0; r < Rows; ++r) into[r] = sums[r] - begin;
         for (int64_t x = begin; x < end; x += columns) {
             prefetch<Rows>(job, to, (x + chunk) * bytes, (x + chunk + columns) * bytes);
-            sum_tile<Rows, Count>(job, x, into);
+            sum_tile<How, Rows, Count>(job, x, into);
         }
         for (int r = 0; r < Rows; ++r) {
             int64_t x = begin;
@@ -95,30 +95,30 @@ void sum_rows(const convolve_rows<E>& job, uint8_t* const* to)
     }
 }
 
-template <class T, class E>
+template <joined How, class T, class E>
 void sum(const convolve_rows<E>& job, uint8_t* const* to)
 {
     if (job.output_rows == 1)
-        sum_rows<T, 1, 4>(job, to);
+        sum_rows<How, T, 1, 4>(job, to);
     else
-        sum_rows<T, 4, vector_bytes == 64 ? 6 : 2>(job, to);
+        sum_rows<How, T, 4, vector_bytes == 64 ? 6 : 2>(job, to);
 }
 
 // A kernel of 3 x 3, the one in most use, without loops.
 
-template <int Y, int Rows, class E>
+template <joined How, int Y, int Rows, class E>
 ZELT_INLINE void add_rows_of_3x3(tile<Rows, 1>& sum, const double* kernel, const E* const* rows, int64_t x,
                                  int64_t step)
 {
     constexpr int size = 3;
     if constexpr (Y < size + Rows - 1) {
         constexpr int first = Y < size ? 0 : Y - size + 1, last = Y < Rows ? Y : Rows - 1;
-        add_row<first, last>(sum, kernel + (Y - first) * size, size, rows[Y] + x, step);
-        add_rows_of_3x3<Y + 1>(sum, kernel, rows, x, step);
+        add_row<How, first, last>(sum, kernel + (Y - first) * size, size, rows[Y] + x, step);
+        add_rows_of_3x3<How, Y + 1>(sum, kernel, rows, x, step);
     }
 }
 
-template <class T, int Rows, class E>
+template <joined How, class T, int Rows, class E>
 void sum_rows_3x3(const convolve_rows<E>& job, uint8_t* const* to)
 {
     constexpr int64_t chunk = 64, bytes = sizeof(T);
@@ -131,7 +131,7 @@ void sum_rows_3x3(const convolve_rows<E>& job, uint8_t* const* to)
     for (int64_t x = 0; x < elements; x += lanes) {
         if (x % chunk == 0) prefetch<Rows>(job, into, (x + chunk) * bytes, (x + 2 * chunk) * bytes);
         tile<Rows, 1> sum{};
-        add_rows_of_3x3<0>(sum, kernel, rows, x, step);
+        add_rows_of_3x3<How, 0>(sum, kernel, rows, x, step);
         if (const int64_t rest = elements - x; rest >= lanes)
             for_each_vector(sum, [&](int r, int, doubles v) { store_as<T>(v, into[r] + x * bytes); });
         else
@@ -140,17 +140,19 @@ void sum_rows_3x3(const convolve_rows<E>& job, uint8_t* const* to)
     }
 }
 
-template <class T, class E>
+template <joined How, class T, class E>
 void sum_3x3(const convolve_rows<E>& job, uint8_t* const* to)
 {
     if (job.output_rows == 1)
-        sum_rows_3x3<T, 1>(job, to);
+        sum_rows_3x3<How, T, 1>(job, to);
     else
-        sum_rows_3x3<T, 4>(job, to);
+        sum_rows_3x3<How, T, 4>(job, to);
 }
 
 template <class T, class E>
-inline constexpr Filters::convolve_loops<E> convolve_loops_of{load_padded_row<T, E>, sum<T, E>,
-                                                              sum_3x3<T, E>};
+inline constexpr Filters::convolve_loops<E> convolve_loops_of{
+    .load = load_padded_row<T, E>,
+    .sum = {sum<joined::rounded, T, E>, sum_3x3<joined::rounded, T, E>},
+    .sum_exact = {sum<exact_products, T, E>, sum_3x3<exact_products, T, E>}};
 
 } // namespace Qor::Luxar::ZELT::ZELT_LEVEL::filters

@@ -28,9 +28,13 @@ inline constexpr int64_t convolve_slack = 64;
 template <class E>
 struct convolve_loops {
     void (*load)(const padded_source&, int64_t y, E* to);
-    /// Fills the output rows, the lowest first.
-    void (*sum)(const convolve_rows<E>&, uint8_t* const* to);
-    void (*sum_3x3)(const convolve_rows<E>&, uint8_t* const* to);
+    /// Fill the output rows, the lowest first.
+    struct sums {
+        void (*any_size)(const convolve_rows<E>&, uint8_t* const* to);
+        void (*size_3x3)(const convolve_rows<E>&, uint8_t* const* to);
+    };
+    sums sum;
+    sums sum_exact; ///< for kernels whose products with pixels are exact
 };
 
 struct convolve_table {

@@ -137,26 +137,50 @@ ZELT_INLINE void for_each_vector(const vectors<Count>& v, F&& f)
     }
 }
 
-template <int Count>
+/// How a product joins a sum: rounded before it, as everywhere, or fused with it where the processor can do
+/// that. For products without rounding these give the same bits.
+enum class joined { rounded, fused };
+#ifdef __FMA__
+inline constexpr joined exact_products = joined::fused;
+#else
+inline constexpr joined exact_products = joined::rounded;
+#endif
+
+template <joined How>
+ZELT_INLINE doubles add_product(doubles sum, double k, doubles x)
+{
+#ifdef __FMA__
+    if constexpr (How == joined::fused) {
+#ifdef __AVX512F__
+        return _mm512_fmadd_pd(_mm512_set1_pd(k), x, sum);
+#else
+        return _mm256_fmadd_pd(_mm256_set1_pd(k), x, sum);
+#endif
+    }
+#endif
+    return sum + k * x;
+}
+
+template <joined How, int Count>
 ZELT_INLINE void add_products(vectors<Count>& sum, double k, const vectors<Count>& x)
 {
     if constexpr (Count > 0) {
-        sum.v += k * x.v;
-        add_products(sum.more, k, x.more);
+        sum.v = add_product<How>(sum.v, k, x.v);
+        add_products<How>(sum.more, k, x.more);
     }
 }
 
 /// The same for rows First to Last. *k is the factor of row First, and each row's factor lies `distance`
 /// before that of the row above.
-template <int First, int Last, int Rows, int Count>
+template <joined How, int First, int Last, int Rows, int Count>
 ZELT_INLINE void add_products(tile<Rows, Count>& sum, const double* k, int64_t distance,
                               const vectors<Count>& x)
 {
     if constexpr (First > 0) {
-        add_products<First - 1, Last - 1>(sum.below, k, distance, x);
+        add_products<How, First - 1, Last - 1>(sum.below, k, distance, x);
     } else if constexpr (Last >= 0) {
-        add_products(sum.row, *k, x);
-        add_products<0, Last - 1>(sum.below, k - distance, distance, x);
+        add_products<How>(sum.row, *k, x);
+        add_products<How, 0, Last - 1>(sum.below, k - distance, distance, x);
     }
 }
 
