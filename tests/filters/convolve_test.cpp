@@ -165,21 +165,25 @@ TEST(Convolve, FlipsTheKernelAndGivesZeroForNone)
     }
 }
 
-/// Runs indices on the calling thread and asks for a stop before one of them.
+/// Runs indices on the calling thread, as if it had more, and asks for a stop before one of them.
 class stopping_pool final : public Thread::ThreadPool {
 public:
-    explicit stopping_pool(int32_t at) : at_(at) {}
-    int GetThreadCount() const override { return 1; }
+    stopping_pool(int threads, int32_t at) : threads_(threads), at_(at) {}
+    int GetThreadCount() const override { return threads_; }
     int GetCurrentWorker() const override { return 0; }
     void parallel(Thread::range indices, const Thread::parallel_body& body) override
     {
         for (int32_t i = indices.start; i < indices.end; ++i) {
             if (i == at_) RequestCancel();
             body(i, {0});
+            ++done;
         }
     }
 
+    int done = 0;
+
 private:
+    int threads_;
     int32_t at_;
 };
 
@@ -189,7 +193,7 @@ TEST(Convolve, StopsBeforeTheNextRowsAndLeavesThemAlone)
     const auto in = random_image<float>({9, 40}, memory_layout::packed, 1, values::plain);
     const auto before = random_image<float>({9, 40}, memory_layout::packed, 2, values::plain);
     auto out = before;
-    stopping_pool pool(3);
+    stopping_pool pool(1, 3);
     EXPECT_THROW(Filters::convolve(in.view(), k.view(), k.anchor, out.view(), &pool), Cancelled);
     int done = 0;
     while (done < 40 && same_bits(out.at(0, done), by_definition(in, 0, done, k))) ++done;
@@ -198,6 +202,17 @@ TEST(Convolve, StopsBeforeTheNextRowsAndLeavesThemAlone)
     expect_equal(out, [&](int x, int y) { return y < done ? by_definition(in, x, y, k) : before.at(x, y); });
 
     Filters::convolve(in.view(), k.view(), k.anchor, out.view(), nullptr);
+    expect_equal(out, [&](int x, int y) { return by_definition(in, x, y, k); });
+}
+
+TEST(Convolve, HandsOutSingleRowsWhereWorkersWouldGetNone)
+{
+    const taps& k = kernels()[1];
+    const auto in = random_image<float>({9, 11}, memory_layout::packed, 1, values::plain);
+    test_image<float> out({9, 11});
+    stopping_pool pool(3, -1);
+    Filters::convolve(in.view(), k.view(), k.anchor, out.view(), &pool);
+    EXPECT_EQ(pool.done, 11);
     expect_equal(out, [&](int x, int y) { return by_definition(in, x, y, k); });
 }
 

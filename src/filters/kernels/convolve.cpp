@@ -50,7 +50,8 @@ class convolution {
 public:
     convolution(const convolve_operands& o, const convolve_loops<E>& loops, int workers)
         : o_(o), sum_(chosen(o, loops)), channels_(channels_of(o.src.type)),
-          contiguous_(o.src.x_stride == channels_ * GetPixmatBits(element_of(o.src.type)) / 8)
+          contiguous_(o.src.x_stride == channels_ * GetPixmatBits(element_of(o.src.type)) / 8),
+          block_rows_(o.dst.height < rows_at_once * workers ? 1 : rows_at_once)
     {
         if (o_.kernel.width == 0 || o_.kernel.height == 0) o_.kernel = {o.kernel.values, 0, 0};
         const int64_t columns = std::max<int64_t>(o_.kernel.width, 1); // a kernel without any still gets rows
@@ -64,11 +65,13 @@ public:
                                 std::vector<output_rows>(rows_at_once, output_rows(o_.dst))});
     }
 
+    int32_t blocks() const { return (o_.dst.height - 1) / block_rows_ + 1; }
+
     void compute(int32_t block, int worker)
     {
         scratch& own = workers_[static_cast<size_t>(worker)];
-        const int32_t top = block * rows_at_once;
-        const int32_t count = std::min(rows_at_once, o_.dst.height - top);
+        const int32_t top = block * block_rows_;
+        const int32_t count = std::min(block_rows_, o_.dst.height - top);
         if (count == rows_at_once) return compute_rows(top, count, own);
         for (int32_t y = top; y < top + count; ++y) compute_rows(y, 1, own);
     }
@@ -115,6 +118,7 @@ private:
     sum_function sum_;
     int32_t channels_;
     bool contiguous_;
+    int32_t block_rows_; ///< of a low image only one, so that each worker has some
     std::vector<scratch> workers_;
 };
 
@@ -122,10 +126,9 @@ template <class E>
 void run(const convolve_operands& o, const convolve_loops<E>& loops, Thread::ThreadPool* pool)
 {
     convolution<E> job(o, loops, pool ? pool->GetThreadCount() : 1);
-    const int32_t blocks = (o.dst.height - 1) / rows_at_once + 1;
-    Thread::run_cancellable(pool, {0, blocks}, [&job](int32_t block, const Thread::ThreadInformation& where) {
-        job.compute(block, where.worker);
-    });
+    Thread::run_cancellable(
+        pool, {0, job.blocks()},
+        [&job](int32_t block, const Thread::ThreadInformation& where) { job.compute(block, where.worker); });
 }
 
 void run(const convolve_operands& o, Thread::ThreadPool* pool)
