@@ -28,8 +28,14 @@ void run(const memory_2d& src, const memory_2d& dst, const gradient_loops<E>& lo
     output_rows out(dst);
     const auto row = filter.in(loops);
     const int64_t step = padded_rows.channels, elements = step * dst.width;
+    const bool contiguous = src.x_stride == GetPixmatBits(src.type) / 8;
     for (int64_t y = 0; y < dst.height; ++y) {
-        row({{rows[y - 1], rows[y], rows[y + 1]}, step, elements}, out.begin(y));
+        const bool known = contiguous && y + 2 < src.height;
+        row({.row = {rows[y - 1], rows[y], rows[y + 1]},
+             .step = step,
+             .elements = elements,
+             .next_row = known ? first_pixel(src) + (y + 2) * src.y_stride : nullptr},
+            out.begin(y));
         out.end(y);
     }
 }

@@ -10,8 +10,9 @@ namespace Qor::Luxar::ZELT::Filters {
 template <class E>
 struct gradient_rows {
     const E* row[3];
-    int64_t step;     ///< numbers from pixel to pixel
-    int64_t elements; ///< numbers of an output row
+    int64_t step;            ///< numbers from pixel to pixel
+    int64_t elements;        ///< numbers of an output row
+    const uint8_t* next_row; ///< the source's, that will be asked for next; null when that is not known
 };
 
 template <class E>
