@@ -72,23 +72,31 @@ TEST(Gradients, AreThoseOfTheDefinitionForFloatsOfEveryKind)
     expect_definitions<float, double>(values::special);
 }
 
-/// The hypotenuse of a right triangle with whole sides: for integers where cutting begins, for floats in the middle
-/// between two of them, and squares next to theirs.
+template <class T>
+void expect_derivative(const test_image<T>& in)
+{
+    test_image<T> out(in.extent());
+    Filters::derivative(in.view(), out.view());
+    expect_equal(out, [&](int x, int y) {
+        return by_definition(in, x, y, [](const auto& n) { return derivative(n); });
+    });
+}
+
+/// Right triangles with whole sides and such as have one side longer by 1. A hypotenuse of the first is for integers where
+/// cutting begins, for floats in the middle between two of them.
 template <class T>
 void expect_magnitudes_of_triangles()
 {
-    for (uint32_t p = 3000; p < 4000; p += 7)
-        for (const uint32_t q : {2900u, 2901u}) {
-            test_image<T> in({3, 3}), out({3, 3});
-            in.set(1, 0, static_cast<T>(p * p - q * q));
-            in.set(0, 1, static_cast<T>(2 * p * q));
-            for (const int more : {0, 1}) {
-                in.set(2, 2, static_cast<T>(more));
-                Filters::derivative(in.view(), out.view());
-                expect_equal(out, [&](int x, int y) {
-                    return by_definition(in, x, y, [](const auto& n) { return derivative(n); });
-                });
+    constexpr int count = 143;
+    for (const uint32_t q : {2900u, 2901u})
+        for (const uint32_t more : {0u, 1u}) {
+            test_image<T> in({4 * count, 3});
+            for (int i = 0; i < count; ++i) {
+                const uint32_t p = 3000 + 7 * static_cast<uint32_t>(i);
+                in.set(4 * i + 1, 0, static_cast<T>(p * p - q * q + more));
+                in.set(4 * i, 1, static_cast<T>(2 * p * q));
             }
+            expect_derivative(in);
         }
 }
 TEST(Gradients, AreRoundedAsThoseOfTheDefinitionWhereRoundingTurns)
@@ -98,6 +106,19 @@ TEST(Gradients, AreRoundedAsThoseOfTheDefinitionWhereRoundingTurns)
         expect_magnitudes_of_triangles<uint32_t>();
         expect_magnitudes_of_triangles<int32_t>();
     });
+}
+
+TEST(Gradients, OfFloatsAreThoseOfTheDefinitionWhateverTheirExponents)
+{
+    generator random(3);
+    for (int exponent = -80; exponent < 80; ++exponent) {
+        test_image<float> in({131, 4});
+        in.fill([&](int, int) {
+            const double unit = std::ldexp(static_cast<double>(random() >> 11), -53);
+            return static_cast<float>(std::ldexp(unit, exponent - static_cast<int>(random() % 20)));
+        });
+        for_each_level([&](level) { expect_derivative(in); });
+    }
 }
 
 TEST(Gradients, SaturateAtASteepEdgeAndVanishOnAPlane)

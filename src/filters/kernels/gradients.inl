@@ -114,10 +114,38 @@ inline void store_run(const run_of_sums<double>& sums, int64_t count, contiguous
     for (int64_t i = 0; i < count; ++i) to[i] = __builtin_hypot(sums.a[i], sums.b[i]);
 }
 
+#ifdef __FMA__
+/// The root in single precision and what it misses, within 2^-44 of the root. False where that can be rounded
+/// in two ways, where the square is too small for its errors to be floats, and where it is not finite: then
+/// `low` is a NaN.
+inline bool store_near_roots(const run_of_sums<float>& sums, int64_t count, contiguous_row<float> to)
+{
+    int32_t doubtful = 0;
+    for (int64_t i = 0; i < count; ++i) {
+        const float a = sums.a[i], b = sums.b[i];
+        const float p = a * a, q = b * b;
+        const float more = p > q ? p : q, less = p > q ? q : p;
+        const float square = more + less;
+        const float rest = less - (square - more) + (__builtin_fmaf(a, a, -p) + __builtin_fmaf(b, b, -q));
+        const float root = __builtin_sqrtf(square);
+        const float missing = (__builtin_fmaf(-root, root, square) + rest) * (0.5f / root);
+        const float margin = root * 0x1p-44f;
+        const float low = root + (missing - margin), high = root + (missing + margin);
+        const bool none = (a == 0) & (b == 0);
+        doubtful |= none | ((low == high) & (square >= 0x1p-100f)) ? 0 : 1;
+        to[i] = none ? 0 : low;
+    }
+    return doubtful == 0;
+}
+#endif
+
 /// Floats have 29 bits less: rounding tells them apart only beside the middle between two floats, or where
 /// floats lose bits. Squares of floats are exact and stay in the range of doubles.
 inline void store_run(const run_of_sums<float>& sums, int64_t count, contiguous_row<float> to)
 {
+#ifdef __FMA__
+    if (store_near_roots(sums, count, to)) return;
+#endif
     uint64_t doubtful = 0; // as wide as a root, which makes vectors of both
     for (int64_t i = 0; i < count; ++i) {
         const double a = sums.a[i], b = sums.b[i];
