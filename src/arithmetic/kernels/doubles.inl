@@ -106,7 +106,22 @@ struct unchanged {
     reals operator()(reals v) const { return v; }
 };
 
-/// A positive number x is 2^exponent m, and m (1 + rest) is the inverse of a table's entry.
+/// A positive number is 2^exponent m, with m in the range of a table of logarithms, and index that of its entry.
+struct table_parts {
+    reals exponent, m;
+    words index;
+};
+template <int size>
+table_parts parts_for(const table_of_logarithms<size>& t, reals x)
+{
+    constexpr int bits_of_size = size == 16 ? 4 : 5;
+    const words raised = bits_of(x) - __builtin_bit_cast(uint64_t, t.from);
+    const reals m = reals_of(bits_of(x) - (raised & (uint64_t{0xfff} << 52)));
+    const words index = raised >> (52 - bits_of_size);
+    return {exponent_in(raised), m, index};
+}
+
+/// m (1 + rest) is the inverse of a table's entry.
 struct logarithm_parts {
     reals high; ///< the logarithm of 2^exponent m / (1 + rest), to 2^-42
     reals low;  ///< what it lacks
@@ -115,11 +130,8 @@ struct logarithm_parts {
 template <int size, class Adjust>
 logarithm_parts split(const table_of_logarithms<size>& t, reals x, Adjust adjust)
 {
-    constexpr int bits_of_size = size == 16 ? 4 : 5;
-    const words raised = bits_of(x) - __builtin_bit_cast(uint64_t, t.from);
-    const reals m = reals_of(bits_of(x) - (raised & (uint64_t{0xfff} << 52)));
-    const words index = raised >> (52 - bits_of_size);
-    const reals exponent = adjust(exponent_in(raised));
+    const auto [own_exponent, m, index] = parts_for(t, x);
+    const reals exponent = adjust(own_exponent);
     return {product_plus(exponent, all(log_2_high), entry(t.high, index)),
             exponent * log_2_low + entry(t.low, index), product_minus_1(m, entry(t.reciprocal, index))};
 }
@@ -219,31 +231,6 @@ sum_of_reals logarithm_in_parts(reals x, Adjust adjust = {})
     const reals rest = (square * r) * (front + square * square * back) + ((low + lost) + lost_of_curve);
     const reals result = curved + rest;
     return {result, (curved - result) + rest};
-}
-
-/// x^exponent by the logarithm of x, for an exponent of up to largest_exponent.
-inline constexpr double largest_exponent = 0x1p16;
-inline reals power_by_logarithm(sum_of_reals log, reals exponent)
-{
-    const reals product = log.high * exponent;
-    return exponential_of_sum(product, rest_of_product(log.high, exponent, product) + log.low * exponent);
-}
-
-/// x^exponent for any x. The exponent is neither 0, nor infinite, nor NaN; above 2^65 it is as good as infinite but for x = 1.
-[[gnu::noinline, gnu::cold]] inline reals power_of_any(reals x, exponent_kind kind)
-{
-    const reals exponent = at_most(at_least(all(kind.exponent), -0x1p65), all(0x1p65));
-    const reals a = magnitude(x);
-    const auto denormal = a < least_normal;
-    const auto [high, low] =
-        logarithm_in_parts(denormal ? a * 0x1p54 : a, [=](reals e) { return denormal ? e - 54 : e; });
-    const reals product = high * exponent;
-    const reals rest = rest_of_product(high, exponent, product) + low * exponent;
-    const reals ordinary = exponential_of_sum(product, at_most(at_least(rest, -0x1p-10), all(0x1p-10)));
-    const reals of_zero = all(kind.exponent > 0 ? 0 : infinity);
-    const reals of_infinity = all(kind.exponent > 0 ? infinity : 0);
-    const reals size = a == 0 ? of_zero : a < infinity ? ordinary : a == infinity ? of_infinity : a;
-    return power_with_sign(x, size, kind);
 }
 
 } // namespace Qor::Luxar::ZELT::ZELT_LEVEL::functions

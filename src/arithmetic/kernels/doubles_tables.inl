@@ -5,8 +5,8 @@
 
 namespace Qor::Luxar::ZELT::ZELT_LEVEL::functions {
 
-/// Of the numbers from `from` to its double, cut into equal steps of their bits, a reciprocal near each middle, of so few
-/// bits that a number times it, less 1, is exact. And minus its logarithm, as a multiple of 2^-42 and a rest.
+/// The numbers from `from` to its double, cut into equal steps of their bits: a reciprocal near the middle of each, of so
+/// few bits that a number times it, less 1, is exact, and minus its logarithm, as a multiple of 2^-42 and a rest.
 template <int size>
 struct table_of_logarithms {
     double from;
@@ -55,6 +55,15 @@ inline constexpr table_of_logarithms<32> logarithms_32 = {
      0x1.1ef78ce2d07f2p-44,  -0x1.8e27ad3213cb8p-45, 0x1.06c18fb4c14c5p-44,
      -0x1.a0b2a08a465dcp-47, -0x1.13a7b5b11cfa7p-44},
 };
+
+/// The logarithms to base 2 that belong to logarithms_16.
+alignas(64) inline constexpr double logarithms_2_16[] = {
+    -0x1.b47ebf73882a1p-2, -0x1.6e221cd9d0cdep-2, -0x1.24407ab0e073ap-2,
+    -0x1.fbc16b902680ap-3, -0x1.acf5e2db4ec94p-3, -0x1.08c588cda79e4p-3,
+    -0x1.663f6fac91316p-4, -0x1.6bad3758efd87p-5, 0,
+    0x1.7d60496cfbb4cp-4,  0x1.563dc29ffacb2p-3,  0x1.f5fd8a9063e35p-3,
+    0x1.4f6fbb2cec598p-2,  0x1.8a8980abfbd32p-2,  0x1.e7df5fe538ab3p-2,
+    0x1.14c560fe68af9p-1};
 
 /// 2^(i / 16), rounded, and the rest.
 struct table_of_powers {

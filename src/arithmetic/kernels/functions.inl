@@ -1,14 +1,14 @@
 // The loops of the functions of a pixel, on adjacent pixels.
 //
 // Single precision: elementary.inl, with the plainest form for runs of ordinary values; the careful form gives those the
-// same bits. Double precision: doubles.inl. Angles too large for a quick reduction: SLEEF's functions for results that are
-// the same on every processor, within one unit in the last place of a double.
+// same bits. Double precision: doubles.inl. Powers of both: powers.inl. Angles too large for a quick reduction: SLEEF's
+// functions for results that are the same on every processor, within one unit in the last place of a double.
 #pragma once
 
-#include "arithmetic/kernels/doubles.inl"
 #include "arithmetic/kernels/elementary.inl"
 #include "arithmetic/kernels/functions_table.h"
 #include "arithmetic/kernels/operators.inl"
+#include "arithmetic/kernels/powers.inl"
 
 #include <sleef.h>
 
@@ -199,6 +199,27 @@ inline void map_power_of_doubles(const uint8_t* from, uint8_t* to, int64_t count
     map<double>(to + end * size, count - end, careful, from + end * size);
 }
 
+/// The same for floats, of which one number is the whole logarithm.
+inline void map_power_of_floats(const uint8_t* from, uint8_t* to, int64_t count, exponent_kind kind)
+{
+    constexpr int64_t size = sizeof(float);
+    const auto careful = [=](reals x) { return power_of_any_float(x, kind); };
+    const int64_t end = count / lanes * lanes;
+    for (int64_t first = 0; first < end; first += run_length) {
+        const int64_t n = end - first < run_length ? end - first : run_length;
+        const auto* const in = reinterpret_cast<const float*>(from + first * size);
+        auto* const out = reinterpret_cast<float*>(to + first * size);
+        double exponents[run_length];
+        for (int64_t i = 0; i < n; i += lanes)
+            store(exponents + i, logarithm_2(load(in + i)) * kind.exponent);
+        for (int64_t i = 0; i < n; i += lanes) {
+            const reals x = load(in + i);
+            store(out + i, all_ordinary(x) ? power_of_2(load(exponents + i)) : careful(x));
+        }
+    }
+    map<float>(to + end * size, count - end, careful, from + end * size);
+}
+
 /// A single product or root: exactly rounded from double precision or at once, to the same bits.
 template <class Function>
 void map_singles(const uint8_t* from, uint8_t* to, int64_t count, Function f)
@@ -227,14 +248,7 @@ void map_power(const uint8_t* from, uint8_t* to, int64_t count, double exponent)
     if constexpr (sizeof(T) == sizeof(double)) {
         map_power_of_doubles(from, to, count, kind);
     } else {
-        each_run<T>(count, [=](int64_t first, int64_t n) {
-            if (are_ordinary(from + first, n))
-                map<T>(
-                    to + first, n, [=](reals x) { return power_of_ordinary(x, exponent); }, from + first);
-            else
-                map<T>(
-                    to + first, n, [=](reals x) { return power(x, kind); }, from + first);
-        });
+        map_power_of_floats(from, to, count, kind);
     }
 }
 
