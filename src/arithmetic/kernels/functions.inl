@@ -1,11 +1,13 @@
 // The loops of the functions of a pixel, on adjacent pixels.
 //
-// Single precision: elementary.inl, with the plainest form for runs of ordinary values; the careful form gives those the
-// same bits. Double precision: doubles.inl. Powers of both: powers.inl. Angles too large for a quick reduction: SLEEF's
-// functions for results that are the same on every processor, within one unit in the last place of a double.
+// Single precision: elementary_floats.inl for exponentials, logarithms, arc sines and arc cosines, else elementary.inl,
+// with the plainest form for runs of ordinary values; the careful form gives those the same bits. Double precision:
+// doubles.inl. Powers of both: powers.inl. Angles too large for a quick reduction: SLEEF's functions, whose results are
+// the same on every processor, within one unit in the last place of a double.
 #pragma once
 
 #include "arithmetic/kernels/elementary.inl"
+#include "arithmetic/kernels/elementary_floats.inl"
 #include "arithmetic/kernels/functions_table.h"
 #include "arithmetic/kernels/operators.inl"
 #include "arithmetic/kernels/powers.inl"
@@ -17,23 +19,46 @@ namespace Qor::Luxar::ZELT::ZELT_LEVEL::functions {
 /// Values that are looked at before one form of a function is taken for all of them.
 inline constexpr int64_t run_length = 256;
 
-/// body(p..., n, q) for all pixels, a vector at a time. The last ones go through memory of a vector's size.
-template <class T, class Function, class... From>
+constexpr int lanes_of(const reals*) { return lanes; }
+constexpr int lanes_of(const singles::floats*) { return singles::float_lanes; }
+
+/// to[i] = f(from[i]...) for all pixels, a vector at a time. The last ones go through memory of a vector's size.
+template <class T, class Vector = reals, class Function, class... From>
 void map(uint8_t* to, int64_t count, Function f, From... from)
 {
-    constexpr int64_t step = lanes * static_cast<int64_t>(sizeof(T));
-    const int64_t end = count / lanes * step, rest = count * static_cast<int64_t>(sizeof(T)) - end;
+    constexpr int width = lanes_of(static_cast<const Vector*>(nullptr));
+    constexpr int64_t step = width * static_cast<int64_t>(sizeof(T));
+    const int64_t end = count / width * step, rest = count * static_cast<int64_t>(sizeof(T)) - end;
+    const auto load_from = [](const T* p) {
+        if constexpr (width == lanes)
+            return load(p);
+        else
+            return singles::load(p);
+    };
+    const auto store_to = [](T* p, Vector v) {
+        if constexpr (width == lanes)
+            store(p, v);
+        else
+            singles::store(p, v);
+    };
     for (int64_t i = 0; i < end; i += step)
-        store(reinterpret_cast<T*>(to + i), f(load(reinterpret_cast<const T*>(from + i))...));
+        store_to(reinterpret_cast<T*>(to + i), f(load_from(reinterpret_cast<const T*>(from + i))...));
     if (rest == 0) return;
     const auto load_rest = [=](const uint8_t* p) {
-        T values[lanes] = {};
+        T values[width] = {};
         __builtin_memcpy(values, p + end, static_cast<size_t>(rest));
-        return load(values);
+        return load_from(values);
     };
-    T results[lanes];
-    store(results, f(load_rest(from)...));
+    T results[width];
+    store_to(results, f(load_rest(from)...));
     __builtin_memcpy(to + end, results, static_cast<size_t>(rest));
+}
+
+/// The same of single-precision numbers in single precision.
+template <class Function>
+void map_floats(const uint8_t* from, uint8_t* to, int64_t count, Function f)
+{
+    map<float, singles::floats>(to, count, f, from);
 }
 
 template <class T>
@@ -63,13 +88,13 @@ inline bool holds_larger(const uint8_t* from, int64_t count, float limit)
     return outside != 0;
 }
 
-/// True when all values are positive and finite.
+/// True when all values are positive, finite and of full precision.
 inline bool are_ordinary(const uint8_t* from, int64_t count)
 {
     int32_t outside = 0;
     for (int64_t i = 0; i < count; ++i) {
         const float v = value_at<float>(from, i);
-        outside |= v > 0 ? 0 : 1;
+        outside |= v >= __FLT_MIN__ ? 0 : 1;
         outside |= v < __builtin_inff() ? 0 : 1;
     }
     return outside == 0;
@@ -115,13 +140,11 @@ inline void map_tangent(const uint8_t* from, uint8_t* to, int64_t count)
 }
 inline void map_arc_sine(const uint8_t* from, uint8_t* to, int64_t count)
 {
-    map<float>(
-        to, count, [](reals x) { return arc_sine(x); }, from);
+    map_floats(from, to, count, [](singles::floats x) { return singles::arc_sine(x); });
 }
 inline void map_arc_cosine(const uint8_t* from, uint8_t* to, int64_t count)
 {
-    map<float>(
-        to, count, [](reals x) { return arc_cosine(x); }, from);
+    map_floats(from, to, count, [](singles::floats x) { return singles::arc_cosine(x); });
 }
 inline void map_arc_tangent(const uint8_t* from, uint8_t* to, int64_t count)
 {
@@ -137,11 +160,11 @@ inline void map_arc_tangent_2(const uint8_t* a, const uint8_t* b, uint8_t* to, i
 template <class T>
 void map_exponential(const uint8_t* from, uint8_t* to, int64_t count)
 {
-    const auto f = [](reals x) {
-        if constexpr (sizeof(T) == sizeof(double)) return exponential_of_double(x);
-        return exponential(x);
-    };
-    map<T>(to, count, f, from);
+    if constexpr (sizeof(T) == sizeof(double))
+        map<T>(
+            to, count, [](reals x) { return exponential_of_double(x); }, from);
+    else
+        map_floats(from, to, count, [](singles::floats x) { return singles::exponential(x); });
 }
 
 template <class T>
@@ -152,12 +175,12 @@ void map_logarithm(const uint8_t* from, uint8_t* to, int64_t count)
             to, count, [](reals x) { return logarithm_of_double(x); }, from);
     } else {
         each_run<T>(count, [=](int64_t first, int64_t n) {
-            if (are_ordinary(from + first, n))
-                map<T>(
-                    to + first, n, [](reals x) { return logarithm_of_ordinary(x); }, from + first);
+            const uint8_t* const p = from + first;
+            if (are_ordinary(p, n))
+                map_floats(p, to + first, n,
+                           [](singles::floats x) { return singles::logarithm_of_ordinary(x); });
             else
-                map<T>(
-                    to + first, n, [](reals x) { return logarithm(x); }, from + first);
+                map_floats(p, to + first, n, [](singles::floats x) { return singles::logarithm(x); });
         });
     }
 }
