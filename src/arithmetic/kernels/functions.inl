@@ -196,51 +196,44 @@ inline reals unusual_power(reals x, double exponent)
     return x == x ? of_number : x;
 }
 
-/// The logarithms of a run come first, so that the processor has the sums of several vectors to work at.
-inline void map_power_of_doubles(const uint8_t* from, uint8_t* to, int64_t count, exponent_kind kind)
+/// to[i] = power(logarithm(from[i])), or careful(from[i]) for vectors with other than ordinary values. The logarithms of a
+/// run come first, so that the processor has the sums of several vectors to work at.
+template <class T, class Logarithm, class Power, class Careful>
+void map_by_logarithms(const uint8_t* from, uint8_t* to, int64_t count, Logarithm logarithm, Power power,
+                       Careful careful)
 {
-    constexpr int64_t size = sizeof(double);
-    const auto careful = [=](reals x) { return power_of_any(x, kind); };
-    const bool usual = kind.exponent <= largest_exponent && kind.exponent >= -largest_exponent;
-    const int64_t end = usual ? count / lanes * lanes : 0;
+    constexpr int64_t size = sizeof(T);
+    const int64_t end = count / lanes * lanes;
     for (int64_t first = 0; first < end; first += run_length) {
         const int64_t n = end - first < run_length ? end - first : run_length;
-        const auto* const in = reinterpret_cast<const double*>(from + first * size);
-        auto* const out = reinterpret_cast<double*>(to + first * size);
-        double high[run_length], low[run_length];
-        for (int64_t i = 0; i < n; i += lanes) {
-            const auto log = logarithm_in_parts(load(in + i));
-            store(high + i, log.high);
-            store(low + i, log.low);
-        }
+        const auto* const in = reinterpret_cast<const T*>(from + first * size);
+        auto* const out = reinterpret_cast<T*>(to + first * size);
+        decltype(logarithm(reals{})) logarithms[run_length / lanes];
+        for (int64_t i = 0; i < n; i += lanes) logarithms[i / lanes] = logarithm(load(in + i));
         for (int64_t i = 0; i < n; i += lanes) {
             const reals x = load(in + i);
-            const sum_of_reals log{load(high + i), load(low + i)};
-            store(out + i, all_ordinary(x) ? power_by_logarithm(log, all(kind.exponent)) : careful(x));
+            store(out + i, all_ordinary(x) ? power(logarithms[i / lanes]) : careful(x));
         }
     }
-    map<double>(to + end * size, count - end, careful, from + end * size);
+    map<T>(to + end * size, count - end, careful, from + end * size);
+}
+
+inline void map_power_of_doubles(const uint8_t* from, uint8_t* to, int64_t count, exponent_kind kind)
+{
+    const auto careful = [=](reals x) { return power_of_any(x, kind); };
+    if (kind.exponent > largest_exponent || kind.exponent < -largest_exponent)
+        return map<double>(to, count, careful, from);
+    map_by_logarithms<double>(
+        from, to, count, [](reals x) { return logarithm_in_parts(x); },
+        [=](const sum_of_reals& log) { return power_by_logarithm(log, all(kind.exponent)); }, careful);
 }
 
 /// The same for floats, of which one number is the whole logarithm.
 inline void map_power_of_floats(const uint8_t* from, uint8_t* to, int64_t count, exponent_kind kind)
 {
-    constexpr int64_t size = sizeof(float);
-    const auto careful = [=](reals x) { return power_of_any_float(x, kind); };
-    const int64_t end = count / lanes * lanes;
-    for (int64_t first = 0; first < end; first += run_length) {
-        const int64_t n = end - first < run_length ? end - first : run_length;
-        const auto* const in = reinterpret_cast<const float*>(from + first * size);
-        auto* const out = reinterpret_cast<float*>(to + first * size);
-        double exponents[run_length];
-        for (int64_t i = 0; i < n; i += lanes)
-            store(exponents + i, logarithm_2(load(in + i)) * kind.exponent);
-        for (int64_t i = 0; i < n; i += lanes) {
-            const reals x = load(in + i);
-            store(out + i, all_ordinary(x) ? power_of_2(load(exponents + i)) : careful(x));
-        }
-    }
-    map<float>(to + end * size, count - end, careful, from + end * size);
+    map_by_logarithms<float>(
+        from, to, count, [=](reals x) { return logarithm_2(x) * kind.exponent; },
+        [](reals log) { return power_of_2(log); }, [=](reals x) { return power_of_any_float(x, kind); });
 }
 
 /// A single product or root: exactly rounded from double precision or at once, to the same bits.
