@@ -59,17 +59,12 @@ template <joined How, int Rows, int Count, class E>
     for_each_vector(sum, [&](int r, int i, doubles v) { store_vector(to[r] + x + i, v); });
 }
 
-/// Asks for the memory that is needed next: beside the output, which is as good as never in a cache, and in
-/// the source, whose rows are each read in one go. A little at a time: many requests at once wait for each other.
+/// Asks for bytes begin to end of the output rows and of the source rows that will be asked for next.
 template <int Rows, class E>
 ZELT_INLINE void prefetch(const convolve_rows<E>& job, uint8_t* const* to, int64_t begin, int64_t end)
 {
-    constexpr int64_t line = 64;
     for (int r = 0; r < Rows; ++r)
-        for (int64_t i = begin; i < end; i += line) {
-            __builtin_prefetch(to[r] + i, 1);
-            if (job.next_row) __builtin_prefetch(job.next_row + r * job.next_stride + i);
-        }
+        filters::prefetch(job.next_row ? job.next_row + r * job.next_stride : nullptr, to[r], begin, end);
 }
 
 template <joined How, class T, int Rows, int Count, class E>

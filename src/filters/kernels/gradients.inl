@@ -161,25 +161,15 @@ inline void store_run(const run_of_sums<float>& sums, int64_t count, contiguous_
     for (int64_t i = 0; i < count; ++i) to[i] = static_cast<float>(__builtin_hypot(sums.a[i], sums.b[i]));
 }
 
-/// Asks for memory that is needed soon: of the output a few runs later, and of the next source row.
-inline void prefetch(const uint8_t* next_row, const uint8_t* to, int64_t begin, int64_t bytes)
-{
-    constexpr int64_t line = 64;
-    for (int64_t i = begin; i < begin + bytes; i += line) {
-        __builtin_prefetch(to + i + 4 * bytes, 1);
-        if (next_row) __builtin_prefetch(next_row + i);
-    }
-}
-
 template <class Filter, class T, class E>
 void gradient_row(const gradient_rows<E>& in, uint8_t* to)
 {
-    constexpr int64_t bytes = sizeof(T);
+    constexpr int64_t bytes = sizeof(T), ahead = 4 * run_length * bytes; // in the output, four runs
     const int64_t elements = in.elements;
     run_of_sums<E> sums;
     for (int64_t x = 0; x < elements; x += run_length) {
         const int64_t count = elements - x < run_length ? elements - x : run_length;
-        prefetch(in.next_row, to, x * bytes, run_length * bytes);
+        prefetch(in.next_row, to + ahead, x * bytes, (x + run_length) * bytes);
         add_run<Filter>(in, x, count, sums);
         store_run(sums, count, contiguous_row<T>{to + x * bytes});
     }

@@ -1,4 +1,4 @@
-// Reads padded rows.
+// Reads padded rows, and asks for memory ahead of loops over rows.
 #pragma once
 
 #include "filters/kernels/padded_row.h"
@@ -7,6 +7,19 @@
 namespace Qor::Luxar::ZELT::ZELT_LEVEL::filters {
 
 using Filters::padded_source;
+
+/// Asks for the memory that is needed next, bytes begin to end: of the output, which is as good as never in a cache, and of
+/// the source row that will be read in one go, unless it is null. A little at a time: many requests at once wait for
+/// each other. Never a call, which would cost the loop around it its registers.
+[[gnu::always_inline]] inline void prefetch(const uint8_t* next_row, const uint8_t* to, int64_t begin,
+                                            int64_t end)
+{
+    constexpr int64_t line = 64;
+    for (int64_t i = begin; i < end; i += line) {
+        __builtin_prefetch(to + i, 1);
+        if (next_row) __builtin_prefetch(next_row + i);
+    }
+}
 
 /// Numbers side by side, from any address on.
 template <class T, class E>
