@@ -3,21 +3,13 @@
 #pragma once
 
 #include "arithmetic/kernels/operators.inl"
+#include "arithmetic/kernels/words.inl"
 
 namespace Qor::Luxar::ZELT::ZELT_LEVEL::arithmetic {
 
 template <class T>
 inline constexpr T highest = is_signed<T> ? static_cast<T>((1u << (8 * sizeof(T) - 1)) - 1u)
                                           : static_cast<T>(-1);
-
-template <class T>
-struct twice_as_wide {
-    using type = uint32_t;
-};
-template <>
-struct twice_as_wide<uint8_t> {
-    using type = uint16_t;
-};
 
 /// The upper half of a product; the lower half is the wrapped product.
 inline int16_t upper_half(int16_t a, int16_t b)
@@ -33,11 +25,7 @@ T saturated(T a, T b, bounds<T> limits)
     const T wrapped = operate<Op>(a, b);
     bool beyond = false;
     T limit = highest<T>;
-    if constexpr (!is_signed<T> && Op == operation::multiply) {
-        using wide = typename twice_as_wide<T>::type;
-        const auto product = static_cast<wide>(wide{a} * wide{b});
-        return static_cast<T>(product < limits.upper ? product : limits.upper);
-    } else if constexpr (!is_signed<T>) {
+    if constexpr (!is_signed<T>) {
         if constexpr (Op == operation::add) beyond = wrapped < a;
         if constexpr (Op == operation::subtract) beyond = a < b;
         const T v = beyond ? limit : wrapped;
@@ -49,8 +37,10 @@ T saturated(T a, T b, bounds<T> limits)
         if constexpr (Op == operation::subtract) beyond = static_cast<T>((a ^ b) & (a ^ wrapped)) < 0;
         if constexpr (Op == operation::multiply) {
             towards = static_cast<T>(a ^ b);
-            beyond = sizeof(T) == 1 ? static_cast<int16_t>(a * b) != wrapped
-                                    : upper_half(a, b) != static_cast<T>(wrapped >> sign);
+            if constexpr (sizeof(T) == 1)
+                beyond = static_cast<int16_t>(a * b) != wrapped;
+            else
+                beyond = upper_half(a, b) != static_cast<T>(wrapped >> sign);
         }
         limit = static_cast<T>((towards >> sign) ^ limit);
         return clamp(beyond ? limit : wrapped, limits);
@@ -132,13 +122,44 @@ void divide_integers(A a, B b, contiguous_row<T> dst, int64_t count, range limit
     }
 }
 
+/// Products without sign, no larger than a limit. Bytes: those of every second one, and of the others.
+template <class T>
+words limited_products(words v, words w, words upper)
+{
+    const auto limited = [=](words product) { return product < upper ? product : upper; };
+    if constexpr (sizeof(T) == 1)
+        return limited((v & 255) * (w & 255)) | limited((v >> 8) * (w >> 8)) << 8;
+    else
+        return upper_halves(v, w) != 0 ? upper : limited(v * w);
+}
+
+template <form Form, class T>
+void multiply_limited(const uint8_t* a, const uint8_t* b, uint8_t* dst, int64_t count, range limits)
+{
+    const words upper = words{} + static_cast<uint16_t>(limits.upper);
+    const int64_t bytes = count * static_cast<int64_t>(sizeof(T));
+    if constexpr (Form == form::images) {
+        each_vector(
+            bytes, [=](words v, words w) { return limited_products<T>(v, w, upper); }, dst, a, b);
+    } else {
+        T number;
+        __builtin_memcpy(&number, b, sizeof number);
+        const words w = words{} + static_cast<uint16_t>(sizeof(T) == 1 ? number * 0x101 : number);
+        each_vector(
+            bytes, [=](words v) { return limited_products<T>(v, w, upper); }, dst, a);
+    }
+}
+
 template <operation Op, form Form, rounding Mode, class T>
 void direct(const uint8_t* a, const uint8_t* b, uint8_t* dst, int64_t count, range limits)
 {
     const auto x = operand<Form, form::value_left, T>(a);
     const auto y = operand<Form, form::value_right, T>(b);
     const contiguous_row<T> out{dst};
-    if constexpr (Op == operation::divide && is_integer<T>) {
+    constexpr bool narrow = is_integer<T> && !is_signed<T> && sizeof(T) < 4;
+    if constexpr (Op == operation::multiply && Mode == rounding::saturate && narrow) {
+        multiply_limited<Form, T>(a, b, dst, count, limits);
+    } else if constexpr (Op == operation::divide && is_integer<T>) {
         divide_integers<Mode>(x, y, out, count, limits);
     } else if constexpr (is_pair<T>) {
         each(

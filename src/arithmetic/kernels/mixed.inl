@@ -32,12 +32,23 @@ bool fits_32_bits(contiguous_row<A>, contiguous_row<B>)
     return false;
 }
 
+/// A sum as a fused product with 1, which has the same bits: conversions keep the units for sums busy.
+template <operation Op, class W>
+W operate_beside_conversions(W a, W b)
+{
+#ifdef __FMA__
+    if constexpr (is_same<W, double> && Op == operation::add) return __builtin_fma(a, 1.0, b);
+    if constexpr (is_same<W, double> && Op == operation::subtract) return __builtin_fma(b, -1.0, a);
+#endif
+    return operate<Op>(a, b);
+}
+
 template <operation Op, rounding Mode, class W, class T, class A, class B, class RowA, class RowB>
 void combine_mixed(RowA a, RowB b, contiguous_row<T> dst, int64_t count, range limits)
 {
     if constexpr (is_real<T>) {
         const auto f = [=](A v, B w) {
-            const W r = operate<Op>(static_cast<W>(v), static_cast<W>(w));
+            const W r = operate_beside_conversions<Op>(static_cast<W>(v), static_cast<W>(w));
             return static_cast<T>(Mode == rounding::saturate ? clamp(r, bounds<W>(limits)) : r);
         };
         each(count, f, dst, a, b);

@@ -3,10 +3,6 @@
 
 #include "arithmetic/kernels/direct.inl"
 
-#ifdef __SSE2__
-#include <immintrin.h>
-#endif
-
 namespace Qor::Luxar::ZELT::ZELT_LEVEL::arithmetic {
 
 template <class T>
@@ -22,35 +18,6 @@ void plus_number(const uint8_t* src, uint8_t* dst, int64_t count, Arithmetic::na
         return static_cast<T>((sum ^ sign) - sign);
     };
     each(count, f, contiguous_row<T>{dst}, contiguous_row<T>{const_cast<uint8_t*>(src)});
-}
-
-#if defined(__AVX512BW__)
-inline constexpr int word_lanes = 32;
-#elif defined(__AVX2__)
-inline constexpr int word_lanes = 16;
-#else
-inline constexpr int word_lanes = 8;
-#endif
-using words = uint16_t __attribute__((vector_size(2 * word_lanes)));
-using signed_words = int16_t __attribute__((vector_size(2 * word_lanes)));
-
-/// The upper halves of products, for which the compiler would compute them in twice the width.
-inline words upper_halves(words a, words b)
-{
-#if defined(__AVX512BW__)
-    return __builtin_bit_cast(
-        words, _mm512_mulhi_epu16(__builtin_bit_cast(__m512i, a), __builtin_bit_cast(__m512i, b)));
-#elif defined(__AVX2__)
-    return __builtin_bit_cast(
-        words, _mm256_mulhi_epu16(__builtin_bit_cast(__m256i, a), __builtin_bit_cast(__m256i, b)));
-#elif defined(__SSE2__)
-    return __builtin_bit_cast(
-        words, _mm_mulhi_epu16(__builtin_bit_cast(__m128i, a), __builtin_bit_cast(__m128i, b)));
-#else
-    words upper{};
-    for (int i = 0; i < word_lanes; ++i) upper[i] = static_cast<uint16_t>((uint32_t{a[i]} * b[i]) >> 16);
-    return upper;
-#endif
 }
 
 /// The whole part of sizes times the factor, low bits kept.
@@ -109,19 +76,8 @@ words times_number_of_vector(words pixels, Arithmetic::narrow_product p)
 template <class T>
 void times_number(const uint8_t* src, uint8_t* dst, int64_t count, Arithmetic::narrow_product p)
 {
-    words pixels{};
-    constexpr auto step = static_cast<int64_t>(sizeof pixels);
-    const int64_t bytes = count * static_cast<int64_t>(sizeof(T));
-    int64_t at = 0;
-    for (; at + step <= bytes; at += step) {
-        __builtin_memcpy(&pixels, src + at, sizeof pixels);
-        pixels = times_number_of_vector<T>(pixels, p);
-        __builtin_memcpy(dst + at, &pixels, sizeof pixels);
-    }
-    const auto rest = static_cast<size_t>(bytes - at);
-    __builtin_memcpy(&pixels, src + at, rest);
-    pixels = times_number_of_vector<T>(pixels, p);
-    __builtin_memcpy(dst + at, &pixels, rest);
+    const auto f = [=](words pixels) { return times_number_of_vector<T>(pixels, p); };
+    each_vector(count * static_cast<int64_t>(sizeof(T)), f, dst, src);
 }
 
 } // namespace Qor::Luxar::ZELT::ZELT_LEVEL::arithmetic
