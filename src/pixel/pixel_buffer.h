@@ -23,12 +23,14 @@ public:
 
     pixel_buffer() noexcept = default;
     pixel_buffer(pixel_buffer&& other) noexcept
-        : base_(std::exchange(other.base_, nullptr)), mapped_bytes_(std::exchange(other.mapped_bytes_, 0))
+        : base_(std::exchange(other.base_, nullptr)), allocated_(std::exchange(other.allocated_, nullptr)),
+          mapped_bytes_(std::exchange(other.mapped_bytes_, 0))
     {
     }
     pixel_buffer& operator=(pixel_buffer&& other) noexcept
     {
         std::swap(base_, other.base_);
+        std::swap(allocated_, other.allocated_);
         std::swap(mapped_bytes_, other.mapped_bytes_);
         return *this;
     }
@@ -42,7 +44,8 @@ public:
 
 private:
     uint8_t* base_ = nullptr;
-    size_t mapped_bytes_ = 0; // 0: from operator new
+    void* allocated_ = nullptr; // from operator new, with room to begin at a boundary
+    size_t mapped_bytes_ = 0;
 };
 
 } // namespace Qor::Luxar
