@@ -136,7 +136,7 @@ words limited_products(words v, words w, words upper)
 template <form Form, class T>
 void multiply_limited(const uint8_t* a, const uint8_t* b, uint8_t* dst, int64_t count, range limits)
 {
-    const words upper = words{} + static_cast<uint16_t>(limits.upper);
+    const words upper = all_words(static_cast<uint16_t>(limits.upper));
     const int64_t bytes = count * static_cast<int64_t>(sizeof(T));
     if constexpr (Form == form::images) {
         each_vector(
@@ -144,7 +144,7 @@ void multiply_limited(const uint8_t* a, const uint8_t* b, uint8_t* dst, int64_t 
     } else {
         T number;
         __builtin_memcpy(&number, b, sizeof number);
-        const words w = words{} + static_cast<uint16_t>(sizeof(T) == 1 ? number * 0x101 : number);
+        const words w = all_words(static_cast<uint16_t>(sizeof(T) == 1 ? number * 0x101 : number));
         each_vector(
             bytes, [=](words v) { return limited_products<T>(v, w, upper); }, dst, a);
     }

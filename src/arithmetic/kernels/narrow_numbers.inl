@@ -24,11 +24,10 @@ void plus_number(const uint8_t* src, uint8_t* dst, int64_t count, Arithmetic::na
 template <class T>
 words products(words sizes, Arithmetic::narrow_product p)
 {
-    const words none{};
-    const words whole = sizes * (none + static_cast<uint16_t>(p.whole));
-    const words low = upper_halves(sizes, none + static_cast<uint16_t>(p.fraction));
+    const words whole = sizes * all_words(static_cast<uint16_t>(p.whole));
+    const words low = upper_halves(sizes, all_words(static_cast<uint16_t>(p.fraction)));
     if constexpr (sizeof(T) == 1) return whole + low;
-    const words factor = none + static_cast<uint16_t>(p.fraction >> 16);
+    const words factor = all_words(static_cast<uint16_t>(p.fraction >> 16));
     const words middle = sizes * factor, without_carry = whole + upper_halves(sizes, factor);
     return middle + low < middle ? without_carry + 1 : without_carry;
 }
@@ -47,7 +46,7 @@ template <class T>
 words times_number(typename narrow_numbers<T>::type pixels, Arithmetic::narrow_product p)
 {
     using numbers = typename narrow_numbers<T>::type;
-    const auto all = [](int32_t value) { return words{} + static_cast<uint16_t>(value); };
+    const auto all = [](int32_t value) { return all_words(static_cast<uint16_t>(value)); };
     const auto as_numbers = [](words w) { return __builtin_bit_cast(numbers, w); };
     const auto v = __builtin_bit_cast(words, pixels);
     if constexpr (is_signed<T>) {

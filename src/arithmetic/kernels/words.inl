@@ -20,6 +20,8 @@ inline constexpr int word_lanes = 8;
 using words = uint16_t __attribute__((vector_size(2 * word_lanes)));
 using signed_words = int16_t __attribute__((vector_size(2 * word_lanes)));
 
+inline words all_words(uint16_t value) { return words{} + value; }
+
 /// The upper halves of products, for which the compiler would compute them in twice the width.
 inline words upper_halves(words a, words b)
 {
