@@ -42,8 +42,8 @@ known_function<T> power_function(double exponent)
 }
 
 const std::vector<known_function<float>> functions_of_angles = {
-    {"sine", mapped(angle_function::sine), [](float x) { return std::sin(double{x}); }, close},
-    {"cosine", mapped(angle_function::cosine), [](float x) { return std::cos(double{x}); }, close},
+    {"sine", mapped(angle_function::sine), [](float x) { return std::sin(double{x}); }},
+    {"cosine", mapped(angle_function::cosine), [](float x) { return std::cos(double{x}); }},
     {"tangent", mapped(angle_function::tangent), [](float x) { return std::tan(double{x}); }, close},
     {"arc sine", mapped(angle_function::arc_sine), [](float x) { return std::asin(double{x}); }},
     {"arc cosine", mapped(angle_function::arc_cosine), [](float x) { return std::acos(double{x}); }},
@@ -155,7 +155,7 @@ test_image<T> same_at_each_level(const known_function<T>& f, const test_image<T>
         else
             first = out;
     });
-    return *first;
+    return first ? *first : in; // after many failures no level runs
 }
 
 template <class T>

@@ -343,8 +343,8 @@ struct IBasicOps : IDispatch {
 /// Pixels     Unsigned and Signed of up to 32 bits, Float 32 and 64. The result is a Float 32 image of the same size.
 /// Arguments  pIOutImg: receives the result, if given. ppIOut: the result, with a reference added.
 /// Values     a pixel becomes a 32-bit float first (a 64-bit float and a large integer are rounded); the result lies
-///            within one unit in its last place, 0.6 but in Asin and Acos where the angle is below 2^22, and has
-///            the same bits on every processor. Zeros keep their sign in Sin, Tan, Asin and Atan.
+///            within one unit in its last place (Atan, Atan2 and, for angles below 2^22, Tan: 0.6), and has the same
+///            bits on every processor. Zeros keep their sign in Sin, Tan, Asin and Atan.
 /// In place   the output may be the input, or either of both, when that is Float 32.
 /// NaN        gives NaN, as does an infinite angle, and a value outside [-1, 1] in Asin and Acos.
 /// Threads    everything runs on the calling thread.

@@ -1,4 +1,5 @@
-// Functions of single-precision angles, and the arc tangents, computed in double precision and rounded once at the end.
+// Tangents, arc tangents, and sines and cosines of larger angles, of single-precision numbers, computed in double
+// precision and rounded once at the end.
 //
 // Products and sums in a fixed order and no fused ones: the bits are the same at every level. The polynomials have the
 // least relative error in their interval, at most 2^-27.5, which leaves results within 0.6 units in the last place

@@ -106,6 +106,22 @@ inline floats exact_product_plus(floats a, float b, floats c)
 #endif
 }
 
+/// The entry of a table at the low three bits of each index.
+inline floats entry(const float (&table)[8], half_words index)
+{
+#if defined(__AVX512F__)
+    return _mm512_maskz_permutexvar_ps(0xffff, __builtin_bit_cast(__m512i, index),
+                                       _mm512_maskz_broadcast_f32x8(0xffff, _mm256_loadu_ps(table)));
+#elif defined(__AVX2__)
+    return _mm256_permutevar8x32_ps(_mm256_loadu_ps(table), __builtin_bit_cast(__m256i, index));
+#else
+    const half_words place = index & 7;
+    floats v{};
+    for (int i = 0; i < float_lanes; ++i) v[i] = table[place[i]];
+    return v;
+#endif
+}
+
 /// Added to a number below 2^22, leaves the nearest whole number in the low bits; subtracted again, as a number.
 inline constexpr float whole = 0x1.8p23f;
 

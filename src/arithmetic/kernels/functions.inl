@@ -1,9 +1,9 @@
 // The loops of the functions of a pixel, on adjacent pixels.
 //
-// Single precision: elementary_floats.inl for exponentials, logarithms, arc sines and arc cosines, else elementary.inl,
-// with the plainest form for runs of ordinary values; the careful form gives those the same bits. Double precision:
-// doubles.inl. Powers of both: powers.inl. Angles too large for a quick reduction: SLEEF's functions, whose results are
-// the same on every processor, within one unit in the last place of a double.
+// Single precision: elementary_floats.inl for exponentials, logarithms, sines and cosines and their arcs, else
+// elementary.inl, with the plainest form for runs of ordinary values; the careful form gives those the same bits.
+// Double precision: doubles.inl. Powers of both: powers.inl. Angles too large for a quick reduction: SLEEF's functions,
+// whose results are the same on every processor, within one unit in the last place of a double.
 #pragma once
 
 #include "arithmetic/kernels/elementary.inl"
@@ -120,16 +120,48 @@ void map_angles(const uint8_t* from, uint8_t* to, int64_t count, Function f, Exa
     });
 }
 
+/// True when a value is larger than quick_angle, NaN or -0.
+inline bool holds_unusual_angle(const uint8_t* from, int64_t count)
+{
+    constexpr auto limit = __builtin_bit_cast(int32_t, singles::quick_angle);
+    int32_t largest = 0, least = 0;
+    for (int64_t i = 0; i < count; ++i) {
+        const auto bits = value_at<int32_t>(from, i), size = bits & 0x7fffffff;
+        largest = size > largest ? size : largest;
+        least = bits < least ? bits : least;
+    }
+    return largest > limit || least == -0x7fffffff - 1;
+}
+
+/// The sine, or the cosine by its start. f computes the same of larger angles, and of -0.
+template <class Function, class Exact>
+void map_sine_from(const uint8_t* from, uint8_t* to, int64_t count, float start, Function f, Exact of_large)
+{
+    const auto quick = [=](singles::floats x) { return singles::sine_from(x, start); };
+    each_run<float>(count, [=](int64_t first, int64_t n) {
+        if (!holds_unusual_angle(from + first, n)) return map_floats(from + first, to + first, n, quick);
+        float angles[run_length], others[run_length];
+        __builtin_memcpy(angles, from + first, static_cast<size_t>(n) * sizeof(float));
+        map_angles(from + first, reinterpret_cast<uint8_t*>(others), n, f, of_large);
+        map_floats(from + first, to + first, n, quick);
+        for (int64_t i = 0; i < n; ++i) {
+            const float size = angles[i] < 0 ? -angles[i] : angles[i];
+            if (size > 0 && size <= singles::quick_angle) continue;
+            __builtin_memcpy(to + first + i * static_cast<int64_t>(sizeof size), others + i, sizeof size);
+        }
+    });
+}
+
 inline void map_sine(const uint8_t* from, uint8_t* to, int64_t count)
 {
-    map_angles(
-        from, to, count, [](reals x) { return sine(x); },
+    map_sine_from(
+        from, to, count, singles::sine_start, [](reals x) { return sine(x); },
         [](double x) { return Sleef_cinz_sind1_u10purec(x); });
 }
 inline void map_cosine(const uint8_t* from, uint8_t* to, int64_t count)
 {
-    map_angles(
-        from, to, count, [](reals x) { return cosine(x); },
+    map_sine_from(
+        from, to, count, singles::cosine_start, [](reals x) { return cosine(x); },
         [](double x) { return Sleef_cinz_cosd1_u10purec(x); });
 }
 inline void map_tangent(const uint8_t* from, uint8_t* to, int64_t count)
