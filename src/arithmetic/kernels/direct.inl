@@ -22,6 +22,7 @@ inline int16_t upper_half(int16_t a, int16_t b)
 template <operation Op, class T>
 T saturated(T a, T b, bounds<T> limits)
 {
+    static_assert(is_signed<T> || Op != operation::multiply, "done by multiply_limited");
     const T wrapped = operate<Op>(a, b);
     bool beyond = false;
     T limit = highest<T>;
@@ -156,8 +157,8 @@ void direct(const uint8_t* a, const uint8_t* b, uint8_t* dst, int64_t count, ran
     const auto x = operand<Form, form::value_left, T>(a);
     const auto y = operand<Form, form::value_right, T>(b);
     const contiguous_row<T> out{dst};
-    constexpr bool narrow = is_integer<T> && !is_signed<T> && sizeof(T) < 4;
-    if constexpr (Op == operation::multiply && Mode == rounding::saturate && narrow) {
+    constexpr bool narrow_unsigned = is_integer<T> && !is_signed<T> && sizeof(T) < 4;
+    if constexpr (Op == operation::multiply && Mode == rounding::saturate && narrow_unsigned) {
         multiply_limited<Form, T>(a, b, dst, count, limits);
     } else if constexpr (Op == operation::divide && is_integer<T>) {
         divide_integers<Mode>(x, y, out, count, limits);

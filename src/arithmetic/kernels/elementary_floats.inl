@@ -61,9 +61,9 @@ inline constexpr float quick_angle = 100;
 /// Where the sine and the cosine begin to count eighths of a half turn: where the sine is -1.
 inline constexpr float sine_start = 4, cosine_start = 8;
 
-/// The sine of an angle up to quick_angle, or the cosine by where its count starts. x is n pi / 8 + r + rest, and with s and
-/// c the sine and cosine of n pi / 8 the result is s cos(r) + c sin(r), from the largest term on s + r + (c - 1) r + ...
-/// Eight eighths further on only the sign is another. The sine of -0 comes out as 0.
+/// The sine of an angle up to quick_angle, or the cosine by where its count starts. x is n pi / 8 + r + rest. With s
+/// and c for the sine and cosine of n pi / 8, the result is s cos(r) + c sin(r); from the largest term on that is
+/// s + r + (c - 1) r + ... Eight eighths further on only the sign is another. The sine of -0 comes out as 0.
 inline floats sine_from(floats x, float start)
 {
     constexpr float sines[8] = {-0x1p0f, -0x1.d906bcp-1f, -0x1.6a09e6p-1f, -0x1.87de2ap-2f,

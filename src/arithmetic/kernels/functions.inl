@@ -77,15 +77,16 @@ void each_run(int64_t count, Body body)
         body(i * static_cast<int64_t>(sizeof(T)), count - i < run_length ? count - i : run_length);
 }
 
-/// True when some value is larger than the limit. NaN is not.
-inline bool holds_larger(const uint8_t* from, int64_t count, float limit)
+/// True when some value is larger than the limit, NaN or -0.
+inline bool holds_unusual_angle(const uint8_t* from, int64_t count, float limit)
 {
-    int32_t outside = 0;
+    int32_t largest = 0, least = 0;
     for (int64_t i = 0; i < count; ++i) {
-        const float v = value_at<float>(from, i);
-        outside |= (v < 0 ? -v : v) > limit ? 1 : 0;
+        const auto bits = value_at<int32_t>(from, i), size = bits & 0x7fffffff;
+        largest = size > largest ? size : largest;
+        least = bits < least ? bits : least;
     }
-    return outside != 0;
+    return largest > __builtin_bit_cast(int32_t, limit) || least == -0x7fffffff - 1;
 }
 
 /// True when all values are positive, finite and of full precision.
@@ -105,32 +106,19 @@ template <class Function, class Exact>
 void map_angles(const uint8_t* from, uint8_t* to, int64_t count, Function f, Exact of_large)
 {
     each_run<float>(count, [=](int64_t first, int64_t n) {
-        if (!holds_larger(from + first, n, largest_angle)) return map<float>(to + first, n, f, from + first);
-        float angles[run_length];
-        __builtin_memcpy(angles, from + first, static_cast<size_t>(n) * sizeof(float));
-        map<float>(to + first, n, f, from + first);
+        const uint8_t* const angles = from + first;
+        if (!holds_unusual_angle(angles, n, largest_angle)) return map<float>(to + first, n, f, angles);
+        float results[run_length];
+        map<float>(reinterpret_cast<uint8_t*>(results), n, f, angles);
         for (int64_t i = 0; i < n; ++i) {
-            const float size = angles[i] < 0 ? -angles[i] : angles[i];
-            if (!(size > largest_angle)) continue;
-            const float r = size < __builtin_inff()
-                                ? static_cast<float>(of_large(static_cast<double>(angles[i])))
-                                : __builtin_nanf("");
-            __builtin_memcpy(to + first + i * static_cast<int64_t>(sizeof r), &r, sizeof r);
+            const float angle = value_at<float>(angles, i), size = __builtin_fabsf(angle);
+            if (size > largest_angle)
+                results[i] = size < __builtin_inff()
+                                 ? static_cast<float>(of_large(static_cast<double>(angle)))
+                                 : __builtin_nanf("");
         }
+        __builtin_memcpy(to + first, results, static_cast<size_t>(n) * sizeof(float));
     });
-}
-
-/// True when a value is larger than quick_angle, NaN or -0.
-inline bool holds_unusual_angle(const uint8_t* from, int64_t count)
-{
-    constexpr auto limit = __builtin_bit_cast(int32_t, singles::quick_angle);
-    int32_t largest = 0, least = 0;
-    for (int64_t i = 0; i < count; ++i) {
-        const auto bits = value_at<int32_t>(from, i), size = bits & 0x7fffffff;
-        largest = size > largest ? size : largest;
-        least = bits < least ? bits : least;
-    }
-    return largest > limit || least == -0x7fffffff - 1;
 }
 
 /// The sine, or the cosine by its start. f computes the same of larger angles, and of -0.
@@ -139,16 +127,17 @@ void map_sine_from(const uint8_t* from, uint8_t* to, int64_t count, float start,
 {
     const auto quick = [=](singles::floats x) { return singles::sine_from(x, start); };
     each_run<float>(count, [=](int64_t first, int64_t n) {
-        if (!holds_unusual_angle(from + first, n)) return map_floats(from + first, to + first, n, quick);
-        float angles[run_length], others[run_length];
-        __builtin_memcpy(angles, from + first, static_cast<size_t>(n) * sizeof(float));
-        map_angles(from + first, reinterpret_cast<uint8_t*>(others), n, f, of_large);
-        map_floats(from + first, to + first, n, quick);
+        const uint8_t* const angles = from + first;
+        if (!holds_unusual_angle(angles, n, singles::quick_angle))
+            return map_floats(angles, to + first, n, quick);
+        float results[run_length], others[run_length];
+        map_floats(angles, reinterpret_cast<uint8_t*>(results), n, quick);
+        map_angles(angles, reinterpret_cast<uint8_t*>(others), n, f, of_large);
         for (int64_t i = 0; i < n; ++i) {
-            const float size = angles[i] < 0 ? -angles[i] : angles[i];
-            if (size > 0 && size <= singles::quick_angle) continue;
-            __builtin_memcpy(to + first + i * static_cast<int64_t>(sizeof size), others + i, sizeof size);
+            const float size = __builtin_fabsf(value_at<float>(angles, i));
+            results[i] = size > 0 && size <= singles::quick_angle ? results[i] : others[i];
         }
+        __builtin_memcpy(to + first, results, static_cast<size_t>(n) * sizeof(float));
     });
 }
 
@@ -228,8 +217,8 @@ inline reals unusual_power(reals x, double exponent)
     return x == x ? of_number : x;
 }
 
-/// to[i] = power(logarithm(from[i])), or careful(from[i]) for vectors with other than ordinary values. The logarithms of a
-/// run come first, so that the processor has the sums of several vectors to work at.
+/// to[i] = power(logarithm(from[i])), or careful(from[i]) for vectors with other than ordinary values. The logarithms
+/// of a run come first, so that the processor has the sums of several vectors to work at.
 template <class T, class Logarithm, class Power, class Careful>
 void map_by_logarithms(const uint8_t* from, uint8_t* to, int64_t count, Logarithm logarithm, Power power,
                        Careful careful)

@@ -8,9 +8,9 @@ namespace Qor::Luxar::ZELT::ZELT_LEVEL::filters {
 
 using Filters::padded_source;
 
-/// Asks for the memory that is needed next, bytes begin to end: of the output, which is as good as never in a cache, and of
-/// the source row that will be read in one go, unless it is null. A little at a time: many requests at once wait for
-/// each other. Never a call, which would cost the loop around it its registers.
+/// Asks for the memory that is needed next, bytes begin to end: of the output, which is as good as never in a cache,
+/// and of the source row that will be read in one go, unless it is null. A little at a time: many requests at once
+/// wait for each other. Never a call, which would cost the loop around it its registers.
 [[gnu::always_inline]] inline void prefetch(const uint8_t* next_row, const uint8_t* to, int64_t begin,
                                             int64_t end)
 {
